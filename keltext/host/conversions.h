@@ -1,0 +1,54 @@
+#pragma once
+// The host's value conversions. Every control reads and writes numbers through these,
+// and only through these, so that one rule holds everywhere.
+#include <cstdint>
+#include <string>
+#include <string_view>
+
+#include "keltext/host/variant.h"
+
+namespace kel {
+
+// A double read from the start of the text: blanks (space, tab, line feed) skipped wherever
+// they stand, optional sign, digits, at most one "." and an optional exponent (E or D);
+// &H and &O prefixes honoured; stops at the first character that cannot continue the number.
+// Never fails: "1,234" gives 1, "1 500" gives 1500, "x7" gives 0, "&H1F" gives 31.
+double leading_value(std::string_view text);
+
+// True for empty, for a number (and a boolean or date), and for a text that reads as a number
+// as a whole (blanks around it, a sign, grouping commas, one "."); false for "", ".", other text.
+bool numeric_test(const Variant& v);
+bool numeric_text(std::string_view text);
+
+// Shortest decimal text of at most 15 significant digits: "12.5", "0.5", "7", "-3";
+// the exponent form ("1E+15", "1.99999997764826E-02") only where the host writes one.
+std::string plain_number_text(double value);
+// A single prints with at most 7 significant digits, as the host prints singles.
+std::string plain_number_text(float value);
+
+// The value's text form: numbers as plain number text, booleans "True"/"False", dates
+// "dd/mm/yyyy", empty "", strings as they are. An object is a type mismatch (13).
+std::string text_of(const Variant& v);
+
+// Rounds to the nearest whole number, halves to the even neighbour (2.5 -> 2, -2.5 -> -2).
+double round_half_even(double value);
+
+// Checked conversions: a number, a boolean, a date, empty (0) or a text that passes the
+// numeric test. Not numeric: error 13. Out of range after rounding: error 6.
+double to_double(const Variant& v);
+float to_single(const Variant& v);
+uint8_t to_byte(const Variant& v);
+int16_t to_int16(const Variant& v);
+int32_t to_int32(const Variant& v);
+// The same for a plain double (error 6 only).
+uint8_t to_byte(double value);
+int16_t to_int16(double value);
+int32_t to_int32(double value);
+
+// Numbers: non-zero is true; text "True"/"False" (any case) or numeric text; else error 13.
+bool to_bool(const Variant& v);
+
+// Case-insensitive (ASCII) comparison of names: property keys, member names.
+bool same_name(std::string_view a, std::string_view b);
+
+}  // namespace kel

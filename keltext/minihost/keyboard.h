@@ -1,0 +1,56 @@
+#pragma once
+// Keys: virtual key codes, the keystroke a key name or character makes, and the send-keys
+// notation the controls queue.
+#include <cstdint>
+#include <optional>
+#include <stdexcept>
+#include <string>
+#include <string_view>
+#include <vector>
+
+namespace kel::mini {
+
+enum : int16_t {
+    kShiftMask = 1,
+    kCtrlMask = 2,
+    kAltMask = 4,
+};
+
+enum VirtualKey : int16_t {
+    kVkBackspace = 8, kVkTab = 9, kVkEnter = 13, kVkEscape = 27, kVkSpace = 32, kVkPageUp = 33,
+    kVkPageDown = 34, kVkEnd = 35, kVkHome = 36, kVkLeft = 37, kVkUp = 38, kVkRight = 39, kVkDown = 40,
+    kVkInsert = 45, kVkDelete = 46, kVkF1 = 112, kVkF12 = 123, kVkNumLock = 144,
+};
+
+// One keystroke: key down and key up with key_code and shift, and a key press in between
+// when the key makes a character.
+struct Keystroke {
+    int16_t key_code = 0;
+    int16_t shift = 0;
+    std::optional<int16_t> char_code;
+    bool operator==(const Keystroke&) const = default;
+};
+
+// The keystroke that types one character of the single-byte set (US layout; characters with
+// no key get key code 0).
+Keystroke keystroke_for_char(uint8_t c);
+
+// "Ctrl+Up", "Shift+Tab", "a", "/", "Enter", "F4": nothing when the name is not a key.
+std::optional<Keystroke> parse_key(std::string_view name);
+
+// One synthetic keystroke of the send-keys notation.
+struct SentKey {
+    enum Kind { tab, back_tab, keystroke } kind = keystroke;
+    Keystroke key;  // for keystroke: {DEL} {END} {HOME} are key down/up only; characters typed
+};
+
+class SendKeysError : public std::runtime_error {
+public:
+    using std::runtime_error::runtime_error;
+};
+
+// Parses "{TAB}", "+{TAB}", "{DEL}", "{END}", "{HOME}", runs of them and plain characters.
+// An unknown {TOKEN} is a SendKeysError naming it.
+std::vector<SentKey> parse_send_keys(std::string_view keys);
+
+}  // namespace kel::mini
