@@ -1,0 +1,265 @@
+#include "keltext/alphanumeric/alpha_rules.h"
+
+#include <gtest/gtest.h>
+
+#include <optional>
+#include <string>
+
+namespace kel {
+namespace {
+
+// ---- character filter by type -------------------------------------------------------------
+
+struct FilterCase {
+    int32_t type;
+    int16_t key;
+    int16_t expected;
+};
+
+class FilterByType : public ::testing::TestWithParam<FilterCase> {};
+
+TEST_P(FilterByType, KeyComesOutAsExpected) {
+    const FilterCase& c = GetParam();
+    AlphaEdit e{"abc", 1, 0, 0, false};
+    const AlphaDecision d = filter_alpha_key(e, c.type, c.key);
+    EXPECT_EQ(d.key, c.expected) << "type " << c.type << " key " << c.key;
+    EXPECT_FALSE(d.select_next);
+    EXPECT_FALSE(d.text.has_value());
+}
+
+constexpr int16_t ch(char c) { return static_cast<int16_t>(static_cast<unsigned char>(c)); }
+
+INSTANTIATE_TEST_SUITE_P(
+    Digits, FilterByType,
+    ::testing::Values(FilterCase{KelANDigits, ch('5'), ch('5')}, FilterCase{KelANDigits, ch('0'), ch('0')},
+                      FilterCase{KelANDigits, ch('9'), ch('9')}, FilterCase{KelANDigits, ch(' '), ch(' ')},
+                      FilterCase{KelANDigits, ch('.'), 0}, FilterCase{KelANDigits, ch('-'), 0},
+                      FilterCase{KelANDigits, ch('+'), 0}, FilterCase{KelANDigits, ch('a'), 0},
+                      FilterCase{KelANDigits, 0xB2, 0} /* superscript two */, FilterCase{KelANDigits, 0, 0},
+                      FilterCase{KelANDigits, 27, 0}, FilterCase{KelANDigits, 300, 0},
+                      FilterCase{KelANDigits, -49, 0}));
+
+INSTANTIATE_TEST_SUITE_P(
+    UAlphaNumeric, FilterByType,
+    ::testing::Values(FilterCase{KelANUAlphaNumeric, ch('a'), ch('A')},
+                      FilterCase{KelANUAlphaNumeric, ch('z'), ch('Z')},
+                      FilterCase{KelANUAlphaNumeric, ch('Q'), ch('Q')},
+                      FilterCase{KelANUAlphaNumeric, ch('1'), ch('1')},
+                      FilterCase{KelANUAlphaNumeric, ch(' '), ch(' ')}, FilterCase{KelANUAlphaNumeric, ch('-'), 0},
+                      FilterCase{KelANUAlphaNumeric, ch('.'), 0}, FilterCase{KelANUAlphaNumeric, ch('@'), 0},
+                      FilterCase{KelANUAlphaNumeric, ch('_'), 0},
+                      FilterCase{KelANUAlphaNumeric, 0xE9, 0} /* e acute: not in the set */));
+
+INSTANTIATE_TEST_SUITE_P(
+    CommStyle, FilterByType,
+    ::testing::Values(FilterCase{KelANCommStyle, ch('@'), ch('@')}, FilterCase{KelANCommStyle, ch('#'), ch('#')},
+                      FilterCase{KelANCommStyle, ch('*'), ch('*')}, FilterCase{KelANCommStyle, ch('('), ch('(')},
+                      FilterCase{KelANCommStyle, ch(')'), ch(')')}, FilterCase{KelANCommStyle, ch('['), ch('[')},
+                      FilterCase{KelANCommStyle, ch(']'), ch(']')}, FilterCase{KelANCommStyle, ch('{'), ch('{')},
+                      FilterCase{KelANCommStyle, ch('}'), ch('}')}, FilterCase{KelANCommStyle, ch('-'), ch('-')},
+                      FilterCase{KelANCommStyle, ch('_'), ch('_')}, FilterCase{KelANCommStyle, ch(' '), ch(' ')},
+                      FilterCase{KelANCommStyle, ch('7'), ch('7')}, FilterCase{KelANCommStyle, ch('a'), ch('a')},
+                      FilterCase{KelANCommStyle, ch('Z'), ch('Z')}, FilterCase{KelANCommStyle, ch('.'), 0},
+                      FilterCase{KelANCommStyle, ch(','), 0}, FilterCase{KelANCommStyle, ch('/'), 0},
+                      FilterCase{KelANCommStyle, ch('&'), 0}, FilterCase{KelANCommStyle, ch('\''), 0},
+                      FilterCase{KelANCommStyle, ch('+'), 0}, FilterCase{KelANCommStyle, ch('<'), 0}));
+
+INSTANTIATE_TEST_SUITE_P(
+    UpperCase, FilterByType,
+    ::testing::Values(FilterCase{KelANUpperCase, ch('a'), ch('A')}, FilterCase{KelANUpperCase, ch('B'), ch('B')},
+                      FilterCase{KelANUpperCase, ch('1'), ch('1')}, FilterCase{KelANUpperCase, ch('-'), ch('-')},
+                      FilterCase{KelANUpperCase, ch('.'), ch('.')},
+                      FilterCase{KelANUpperCase, 0xE9, 0xC9} /* e acute to E acute */,
+                      FilterCase{KelANUpperCase, 0xFF, 0x9F} /* y diaeresis */,
+                      FilterCase{KelANUpperCase, 0, 0}, FilterCase{KelANUpperCase, 300, 300}));
+
+INSTANTIATE_TEST_SUITE_P(
+    UserKeysAndUnknown, FilterByType,
+    ::testing::Values(FilterCase{KelANUserKeys, ch('a'), ch('a')}, FilterCase{KelANUserKeys, ch('.'), ch('.')},
+                      FilterCase{KelANUserKeys, 0, 0}, FilterCase{KelANUserKeys, 27, 27},
+                      FilterCase{7, ch('a'), ch('a')}, FilterCase{-1, ch('x'), ch('x')},
+                      FilterCase{1000000, ch('!'), ch('!')}));
+
+// Sentence case capitalises only at the very start of the text.
+TEST(SentenceFilter, UpperCaseOnlyAtCaretZero) {
+    struct Case {
+        const char* text;
+        int32_t caret;
+        char key;
+        char expected;
+    } cases[] = {
+        {"", 0, 'h', 'H'},           {"ello", 0, 'h', 'H'}, {"Hello", 5, 'h', 'h'},
+        {"Done. ", 6, 'h', 'h'},     {"a", 1, 'b', 'b'},    {"", 0, '1', '1'},
+        {"x", 0, '.', '.'},
+    };
+    for (const Case& c : cases) {
+        const AlphaDecision d = filter_alpha_key({c.text, c.caret, 0, 0, false}, KelANSentence, ch(c.key));
+        EXPECT_EQ(d.key, ch(c.expected)) << c.text << " @" << c.caret;
+    }
+}
+
+// ---- overwrite emulation ---------------------------------------------------------------------
+
+TEST(OverwriteEmulation, SelectsNextCharacterOnlyWhenSomethingIsInserted) {
+    struct Case {
+        int32_t type;
+        int16_t key;
+        bool overwrite;
+        int32_t sel_length;
+        bool select_next;
+    } cases[] = {
+        {KelANDigits, ch('9'), true, 0, true},        {KelANDigits, ch('9'), false, 0, false},
+        {KelANDigits, ch('9'), true, 2, false},       {KelANDigits, ch('a'), true, 0, false},
+        {KelANUAlphaNumeric, ch('a'), true, 0, true}, {KelANUAlphaNumeric, ch('.'), true, 0, false},
+        {KelANCommStyle, ch('@'), true, 0, true},     {KelANCommStyle, ch('.'), true, 0, false},
+        {KelANUpperCase, ch('x'), true, 0, true},     {KelANSentence, ch('x'), true, 0, true},
+        // A key the form dropped (0) or one the edit box does not insert leaves the box alone.
+        {KelANUpperCase, 0, true, 0, false},          {KelANSentence, 0, true, 0, false},
+        {KelANUpperCase, 27, true, 0, false},
+        // The form's own KeyPress is the only filter of these: no emulation.
+        {KelANUserKeys, ch('x'), true, 0, false},     {42, ch('x'), true, 0, false},
+    };
+    for (const Case& c : cases) {
+        const AlphaDecision d = filter_alpha_key({"123", 0, c.sel_length, 0, c.overwrite}, c.type, c.key);
+        EXPECT_EQ(d.select_next, c.select_next) << "type " << c.type << " key " << c.key;
+    }
+}
+
+// ---- title case ----------------------------------------------------------------------------
+
+struct TitleCase {
+    const char* name;
+    const char* text;
+    int32_t caret;
+    int32_t sel_length;
+    int32_t limit;
+    bool overwrite;
+    int16_t key;
+    const char* expected;         // the text written back; nullptr: none
+    std::optional<int32_t> caret_set;  // the caret moved before the text is written
+};
+
+class TitleCaseRebuild : public ::testing::TestWithParam<TitleCase> {};
+
+TEST_P(TitleCaseRebuild, Rebuilds) {
+    const TitleCase& c = GetParam();
+    const AlphaDecision d = filter_alpha_key({c.text, c.caret, c.sel_length, c.limit, c.overwrite}, KelANTitleCase, c.key);
+    EXPECT_EQ(d.key, 0);
+    EXPECT_FALSE(d.select_next);
+    if (c.expected) {
+        ASSERT_TRUE(d.text.has_value());
+        EXPECT_EQ(*d.text, c.expected);
+    } else {
+        EXPECT_FALSE(d.text.has_value());
+    }
+    EXPECT_EQ(d.caret, c.caret_set);
+}
+
+const TitleCase kTitleCases[] = {
+    {"EmptyBoxTakesAnyCharacterUpperCased", "", 0, 0, 0, false, ch('j'), "J", std::nullopt},
+    {"EmptyBoxTakesSpace", "", 0, 0, 0, false, ch(' '), " ", std::nullopt},
+    {"EmptyBoxIgnoresLimit", "", 0, 0, 0, true, ch('x'), "X", std::nullopt},
+    {"SpaceAtEndCapitalisesFirstLetter", "john", 4, 0, 0, false, ch(' '), "John ", 5},
+    {"LetterAfterSpace", "John ", 5, 0, 0, false, ch('s'), "John S", std::nullopt},
+    {"LetterInsideWordKeepsCase", "John S", 6, 0, 0, false, ch('m'), "John Sm", std::nullopt},
+    {"UpperCaseInsideWordIsNotLowered", "Jo", 2, 0, 0, false, ch('H'), "JoH", std::nullopt},
+    {"SpaceSplitsWord", "Johnsmith", 4, 0, 0, false, ch(' '), "John Smith", std::nullopt},
+    {"SpaceBeforeSpace", "John Smith", 4, 0, 0, false, ch(' '), "John  Smith", 5},
+    {"HyphenIsNoWordBoundary", "a-b", 3, 0, 0, false, ch('c'), "A-bc", std::nullopt},
+    {"PeriodIsNoWordBoundary", "Mr.", 3, 0, 0, false, ch('x'), "Mr.x", std::nullopt},
+    {"LetterAtStartOfText", "ohn", 0, 0, 0, false, ch('j'), "John", std::nullopt},
+    {"InsertFullBoxRefuses", "Abcde", 2, 0, 5, false, ch('x'), "Abcde", std::nullopt},
+    {"TrailingSpacesDoNotCountForLetters", "Abc  ", 2, 0, 5, false, ch('x'), "Abxc  ", std::nullopt},
+    {"FullBoxRefusesSpace", "Abcde", 2, 0, 5, false, ch(' '), "Abcde", std::nullopt},
+    {"TrailingSpacesCountForSpace", "Abc  ", 1, 0, 5, false, ch(' '), "Abc  ", std::nullopt},
+    {"LimitAboveLengthTakesSpace", "Abcd", 1, 0, 5, false, ch(' '), "A Bcd", std::nullopt},
+    {"FullBoxTypingFollowingCharacterStepsOver", "Abcde", 2, 0, 5, false, ch('c'), "Abcde", 3},
+    {"NegativeLimitIsNoLimit", "Abcde", 5, 0, -1, false, ch('f'), "Abcdef", std::nullopt},
+    {"OverwriteReplacesNextCharacter", "Abc", 1, 0, 0, true, ch('x'), "Axc", std::nullopt},
+    {"OverwriteAtEndAppendsWhateverTheLimit", "Abc", 3, 0, 3, true, ch('d'), "Abcd", std::nullopt},
+    {"OverwriteWithSameCharacterStepsOver", "Abc", 1, 0, 0, true, ch('b'), "Abc", 2},
+    {"OverwriteSpaceCapitalisesCharacterAfter", "Abcd", 1, 0, 0, true, ch(' '), "A Cd", std::nullopt},
+    {"OverwriteSpaceOnLastCharacter", "Abc", 2, 0, 0, true, ch(' '), "Ab ", std::nullopt},
+    {"OverwriteSpaceOverSpaceStepsOver", "Ab cd", 2, 0, 0, true, ch(' '), "Ab Cd", 3},
+    {"OverwriteSpaceAtEndAppends", "Ab", 2, 0, 0, true, ch(' '), "Ab ", 3},
+    {"SelectionReplacedByLetter", "Abcd", 1, 2, 0, false, ch('x'), "Axd", std::nullopt},
+    {"SelectionReplacedByLetterAfterSpace", "Ab cd", 3, 2, 0, false, ch('x'), "Ab X", std::nullopt},
+    {"SelectionReplacedBySpace", "Abcd", 1, 2, 0, false, ch(' '), "A D", std::nullopt},
+    {"SelectionToEndReplacedBySpace", "Abcd", 1, 3, 0, false, ch(' '), "A ", std::nullopt},
+    {"SelectionReplacedIgnoresLimit", "Abcde", 0, 5, 5, false, ch('z'), "Z", std::nullopt},
+    {"WholeTextSelectedReplacedBySpace", "Abc", 0, 3, 0, false, ch(' '), " ", std::nullopt},
+    {"AccentedLetterUpperCased", "Ab ", 3, 0, 0, false, static_cast<int16_t>(0xE9), "Ab \xC9", std::nullopt},
+    // Keys that insert nothing into an edit box insert nothing here either.
+    {"DroppedKeyLeavesText", "abc", 1, 0, 0, false, 0, nullptr, std::nullopt},
+    {"DroppedKeyLeavesEmptyText", "", 0, 0, 0, false, 0, nullptr, std::nullopt},
+    {"EscapeInsertsNothing", "abc", 1, 0, 0, false, 27, nullptr, std::nullopt},
+    {"CodeOutsideTheSetInsertsNothing", "abc", 1, 0, 0, false, 400, nullptr, std::nullopt},
+    // Out-of-range positions from a misbehaving caller are clamped to the text.
+    {"CaretPastEndClamped", "ab", 9, 0, 0, false, ch('c'), "Abc", std::nullopt},
+    {"NegativeCaretClamped", "ab", -3, 0, 0, false, ch('c'), "Cab", std::nullopt},
+    {"SelectionPastEndClamped", "abcd", 2, 99, 0, false, ch('x'), "Abx", std::nullopt},
+};
+
+INSTANTIATE_TEST_SUITE_P(Cases, TitleCaseRebuild, ::testing::ValuesIn(kTitleCases),
+                         [](const auto& info) { return std::string(info.param.name); });
+
+TEST(TitleCaseRebuild, TextLongerThanSixteenBitCaret) {
+    std::string text(70000, 'a');
+    const AlphaDecision d = filter_alpha_key({text, 69000, 0, 0, false}, KelANTitleCase, ch(' '));
+    ASSERT_TRUE(d.text.has_value());
+    ASSERT_EQ(d.text->size(), 70001u);
+    EXPECT_EQ((*d.text)[69000], ' ');
+    EXPECT_EQ((*d.text)[69001], 'A');
+    EXPECT_EQ((*d.text)[0], 'A');
+}
+
+// ---- key-press dispatch, key-down, change ----------------------------------------------------
+
+TEST(KeyPressDispatch, PassesDropsAndFilters) {
+    struct Case {
+        int16_t code;
+        KeyPressAction action;
+    } cases[] = {
+        {8, KeyPressAction::pass},    {9, KeyPressAction::pass},     {10, KeyPressAction::pass},
+        {13, KeyPressAction::drop},   {0, KeyPressAction::filter},   {27, KeyPressAction::filter},
+        {32, KeyPressAction::filter}, {ch('a'), KeyPressAction::filter}, {255, KeyPressAction::filter},
+        {-8, KeyPressAction::filter},
+    };
+    for (const Case& c : cases) EXPECT_EQ(key_press_action(c.code), c.action) << c.code;
+}
+
+TEST(KeyDown, CtrlArrowsAndRecording) {
+    struct Case {
+        int16_t key_code, shift;
+        bool ctrl_down;
+        std::string_view send;
+        bool record;
+    } cases[] = {
+        {38, 0, false, "+{TAB}", false}, {40, 0, false, "{TAB}", false}, {38, 1, false, "+{TAB}", false},
+        {38, 2, true, "", false},        {40, 3, true, "", false},       {65, 2, true, "", false},
+        {65, 0, false, "", true},        {8, 0, false, "", true},        {46, 4, false, "", true},
+        {0, 0, false, "", true},         {37, 6, true, "", false},
+    };
+    for (const Case& c : cases) {
+        const KeyDownDecision d = key_down_decision(c.key_code, c.shift);
+        EXPECT_EQ(d.ctrl_down, c.ctrl_down) << c.key_code << "/" << c.shift;
+        EXPECT_EQ(d.send_keys, c.send) << c.key_code << "/" << c.shift;
+        EXPECT_EQ(d.record, c.record) << c.key_code << "/" << c.shift;
+    }
+}
+
+TEST(ChangeCaret, ByLastKey) {
+    struct Case {
+        int16_t last_key;
+        int32_t saved;
+        std::optional<int32_t> caret;
+    } cases[] = {
+        {8, 3, 2},          {8, 1, 0},           {8, 0, std::nullopt}, {46, 4, std::nullopt},
+        {46, 0, std::nullopt}, {65, 0, 1},       {65, 4, 5},           {0, 2, 3},
+        {32, 40000, 40001}, {65, 2147483647, 2147483647},
+    };
+    for (const Case& c : cases) EXPECT_EQ(caret_after_change(c.last_key, c.saved), c.caret) << c.last_key << "/" << c.saved;
+}
+
+}  // namespace
+}  // namespace kel
