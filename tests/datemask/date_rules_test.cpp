@@ -1,0 +1,172 @@
+#include "keltext/datemask/date_rules.h"
+
+#include <gtest/gtest.h>
+
+#include "keltext/host/date.h"
+
+namespace kel {
+namespace {
+
+struct NormalizeCase {
+    const char* text;
+    bool zub_date;
+    bool trigger_error;
+    const char* expected;
+};
+
+TEST(NormalizeDateText, Table) {
+    const NormalizeCase cases[] = {
+        // Day capped by the month.
+        {"31/01/2003", false, false, "31/01/2003"},
+        {"32/01/2003", false, false, "31/01/2003"},
+        {"31/04/2003", false, false, "30/04/2003"},
+        {"31/06/2003", false, false, "30/06/2003"},
+        {"31/09/2003", false, false, "30/09/2003"},
+        {"31/11/2003", false, false, "30/11/2003"},
+        {"99/12/2003", false, false, "31/12/2003"},
+        {"45/13/2003", false, false, "31/12/2003"},
+        // February: the four-year rule alone, a blank year counts as divisible.
+        {"29/02/2003", false, false, "28/02/2003"},
+        {"30/02/2004", false, false, "29/02/2004"},
+        {"29/02/2004", false, false, "29/02/2004"},
+        {"29/02/1900", false, false, "29/02/1900"},
+        {"31/02/2100", false, false, "29/02/2100"},
+        {"30/02/    ", false, false, "29/02/    "},
+        {"28/02/2003", false, false, "28/02/2003"},
+        // Year widening.
+        {"12/05/03  ", false, false, "12/05/2003"},
+        {"12/05/45  ", false, false, "12/05/1945"},
+        {"12/05/40  ", false, false, "12/05/2040"},
+        {"12/05/41  ", false, false, "12/05/1941"},
+        {"12/05/99  ", false, false, "12/05/1999"},
+        {"12/05/0   ", false, false, "12/05/2000"},
+        {"12/05/203 ", false, false, "12/05/2003"},
+        {"12/05/ 03 ", false, false, "12/05/2003"},
+        {"12/05/0045", false, false, "12/05/1945"},
+        {"12/05/1999", false, false, "12/05/1999"},
+        {"12/05/ab  ", false, false, "12/05/ab  "},
+        {" 5/ 3/03  ", false, false, "05/03/2003"},
+        // Blank and zero fields: a day that stays 0 sends the month reading astray, so the
+        // date falls back to the first of January.
+        {"  /  /    ", false, false, "01/01/    "},
+        {"  /05/2003", false, false, "01/01/2003"},
+        {"00/05/2003", false, false, "01/01/2003"},
+        {" 0/05/2003", false, false, "01/01/2003"},
+        {"12/00/2003", false, false, "12/01/2003"},
+        {"12/  /2003", false, false, "12/01/2003"},
+        {"5 /  /    ", false, false, "05/01/    "},
+        {"256/01/2003", false, false, "01/12/2003"},  // month read from "56"
+        {"12/05", false, false, "12/00/"},
+        {"", false, false, ""},
+        // "-" separators: only the widened year comes back.
+        {"12-05-03", false, false, "2003"},
+        {"12-05-45", false, false, "1945"},
+        {"12-05-2003", false, false, ""},
+        {"12/05-03  ", false, false, "12/05/2003"},
+        // 28-day months.
+        {"30/01/2003", true, false, "28/01/2003"},
+        {"31/12/2003", true, false, "28/12/2003"},
+        {"45/13/2003", true, false, "28/12/2003"},
+        {"29/02/2004", true, false, "28/02/2004"},
+        {"28/05/2003", true, false, "28/05/2003"},
+        // No-correction mode: a non-date is left alone, a date keeps its day.
+        {"30/01/2003", true, true, "30/01/2003"},
+        {"31/04/2003", true, true, "31/04/2003"},
+        {"29/02/2003", true, true, "29/02/2003"},
+        {"  /  /    ", true, true, "  /  /    "},
+        {"12/05/03  ", true, true, "12/05/2003"},
+        {"31/04/2003", false, true, "31/04/2003"},
+        {" 5/ 3/03  ", false, true, "05/03/2003"},
+    };
+    for (const auto& c : cases)
+        EXPECT_EQ(NormalizeDateText(c.text, c.zub_date, c.trigger_error), c.expected)
+            << '"' << c.text << "\" zub=" << c.zub_date << " trigger=" << c.trigger_error;
+}
+
+TEST(PromptToBlank, Table) {
+    struct Case {
+        const char* text;
+        int32_t style;
+        const char* expected;
+    };
+    const Case cases[] = {
+        {"__/__/____", ddMMyyyy, "  /  /    "},
+        {"12/0_/2003", ddMMyyyy, "12/0 /2003"},
+        {"05/0_A", mmyyA, "05/0 A"},
+        {"__/___", mmyyA, "  /   "},
+        {"__/__/____", 7, "  /  /____"},
+        // Other lengths keep every character they have.
+        {"__/__/____", mmyyA, "  /  /____"},
+        {"1_", ddMMyyyy, "1 "},
+        {"", ddMMyyyy, ""},
+        {"__/__/_____x", ddMMyyyy, "  /  /    _x"},
+    };
+    for (const auto& c : cases) EXPECT_EQ(PromptToBlank(c.text, c.style), c.expected) << c.text;
+}
+
+TEST(FormatParts, DayAndMonth) {
+    struct Case {
+        const char* text;
+        const char* day;
+        const char* month;
+    };
+    const Case cases[] = {
+        {"5 /  /    ", "05", "01"},
+        {" 5/ 5/    ", "05", "05"},
+        {"  /  /    ", "01", "01"},
+        {"00/00/    ", "01", "01"},
+        {"31/12/    ", "31", "12"},
+        {"32/13/    ", "", ""},
+        {"45/10/    ", "", "10"},
+        {"09/1 /    ", "09", "01"},
+        {"", "01", "01"},
+        {"7", "07", "01"},
+    };
+    for (const auto& c : cases) {
+        EXPECT_EQ(FormatDayPart(c.text), c.day) << c.text;
+        EXPECT_EQ(FormatMonthPart(c.text), c.month) << c.text;
+    }
+}
+
+TEST(CheckMonthYear, Table) {
+    struct Case {
+        const char* text;
+        bool ok;
+    };
+    const Case cases[] = {
+        {"05/03 ", true},   {"05/03A", true},  {"12/99Z", true}, {" 1/03A", true},
+        {"1 /03A", true},   {"05/03", true},   {"00/03A", false}, {"13/03A", false},
+        {"05/0 A", false},  {"05/ 3A", false}, {"  /03A", false}, {"05/0", false},
+        {"", false},        {"-1/03A", false},
+    };
+    for (const auto& c : cases) EXPECT_EQ(CheckMonthYear(c.text), c.ok) << '"' << c.text << '"';
+}
+
+TEST(ClampToDateRange, Table) {
+    const Variant none;
+    const Variant y2000("01/01/2000");
+    const Variant end1998("31/12/1998");
+    const Variant end2004(*make_date(2004, 12, 31));
+    struct Case {
+        const char* text;
+        Variant min, max;
+        const char* expected;
+    };
+    const Case cases[] = {
+        {"01/01/1999", y2000, none, "01/01/2000"},
+        {"01/01/1999", y2000, end1998, "31/12/1998"},  // crossed bounds: the upper one wins
+        {"01/01/2000", y2000, none, "01/01/2000"},
+        {"15/06/2005", none, end2004, "31/12/2004"},
+        {"31/12/2004", none, end2004, "31/12/2004"},
+        {"15/06/2003", y2000, end2004, "15/06/2003"},
+        {"15/06/2003", Variant("31/02/2003"), Variant("xx"), "15/06/2003"},
+        {"15/06/1990", Variant("2000-01-01"), none, "01/01/2000"},
+        {"12/05/03  ", none, none, "12/05/03  "},
+        {"12/05/03  ", none, Variant("01/01/2003"), "01/01/2003"},
+        {"not a date", y2000, none, "not a date"},
+    };
+    for (const auto& c : cases) EXPECT_EQ(ClampToDateRange(c.text, c.min, c.max), c.expected) << c.text;
+}
+
+}  // namespace
+}  // namespace kel
