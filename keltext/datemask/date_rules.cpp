@@ -28,8 +28,12 @@ std::string_view trim_blanks(std::string_view s) {
 // fail (a text that is not numeric, a blank one included, or a result out of range).
 std::optional<double> double_of(std::string_view s) {
     if (!numeric_text(s)) return std::nullopt;
-    const double d = to_double(Variant(s));
-    if (!std::isfinite(d)) return std::nullopt;
+    // A numeric text reads the same from its start once its grouping commas are gone, and
+    // reading it that way never fails: a value too large for a double simply is no value here.
+    std::string plain(s);
+    std::erase(plain, ',');
+    const double d = leading_value(plain);
+    if (!std::isfinite(d) || std::fabs(d) > 1e300) return std::nullopt;
     return d;
 }
 

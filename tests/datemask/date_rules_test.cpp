@@ -45,6 +45,8 @@ TEST(NormalizeDateText, Table) {
         {"12/05/0045", false, false, "12/05/1945"},
         {"12/05/1999", false, false, "12/05/1999"},
         {"12/05/ab  ", false, false, "12/05/ab  "},
+        {"30/02/9e9999", false, false, "29/02/9e9999"},
+        {"12/05/2,003", false, false, "12/05/2003"},
         {" 5/ 3/03  ", false, false, "05/03/2003"},
         // Blank and zero fields: a day that stays 0 sends the month reading astray, so the
         // date falls back to the first of January.
