@@ -13,17 +13,25 @@ namespace kel {
 // they stand, optional sign, digits, at most one "." and an optional exponent (E or D);
 // &H and &O prefixes honoured; stops at the first character that cannot continue the number.
 // Never fails: "1,234" gives 1, "1 500" gives 1500, "x7" gives 0, "&H1F" gives 31.
+// An &H or &O number is the value of its digits ("&HFFFF" is 65535, not a 16-bit pattern).
+// A number beyond the double range gives the largest double of its sign, never infinity.
 double leading_value(std::string_view text);
 
 // True for empty, for a number (and a boolean or date), and for a text that reads as a number
 // as a whole (blanks around it, a sign, grouping commas, one "."); false for "", ".", other text.
+// A grouping comma stands between two digits of the integer part; an exponent (E or D) and the
+// &H / &O forms are numbers too; a sign only leads, and blanks only surround the number.
 bool numeric_test(const Variant& v);
 bool numeric_text(std::string_view text);
 
 // Shortest decimal text of at most 15 significant digits: "12.5", "0.5", "7", "-3";
 // the exponent form ("1E+15", "1.99999997764826E-02") only where the host writes one.
+// Fixed form unless the rounded value reaches 1E+15 or a fraction would need more than 15
+// decimals; then mantissa and "E+NN"/"E-NN". Infinities and NaN print "Infinity",
+// "-Infinity" and "NaN".
 std::string plain_number_text(double value);
-// A single prints with at most 7 significant digits, as the host prints singles.
+// A single prints with at most 7 significant digits, as the host prints singles, by the same
+// rule with 7 in place of 15 (1E+07, 1.234568E-02).
 std::string plain_number_text(float value);
 
 // The value's text form: numbers as plain number text, booleans "True"/"False", dates
@@ -34,7 +42,8 @@ std::string text_of(const Variant& v);
 double round_half_even(double value);
 
 // Checked conversions: a number, a boolean, a date, empty (0) or a text that passes the
-// numeric test. Not numeric: error 13. Out of range after rounding: error 6.
+// numeric test. Not numeric: error 13. Out of range after rounding: error 6 (also for NaN and
+// infinities, and for a text naming a number beyond the double range).
 double to_double(const Variant& v);
 float to_single(const Variant& v);
 uint8_t to_byte(const Variant& v);
