@@ -1,0 +1,33 @@
+#include "keltext/minihost/buttons.h"
+
+namespace kel::mini {
+
+void MiniCheckBox::Value(int16_t v) {
+    if (v < 0 || v > 2) raise_error(kInvalidPropertyValue);
+    if (v == value_) return;
+    value_ = v;
+    fire_click();
+}
+
+void MiniCheckBox::list_members(std::vector<std::string>& m) const {
+    CaptionImpl::list_members(m);
+    m.push_back("Value");
+}
+
+std::optional<Variant> MiniCheckBox::peek_member(std::string_view m, std::optional<int32_t> index) const {
+    if (same_name(m, "Value")) return no_index(index), Variant(value_);
+    return CaptionImpl::peek_member(m, index);
+}
+
+bool MiniCheckBox::poke_member(std::string_view m, const Variant& v, std::optional<int32_t> index) {
+    if (same_name(m, "Value")) return no_index(index), Value(to_int16(v)), true;
+    return CaptionImpl::poke_member(m, v, index);
+}
+
+void MiniLabel::set_caption(const std::string& c) {
+    if (c == caption_) return;
+    caption_ = c;
+    fire_change();
+}
+
+}  // namespace kel::mini

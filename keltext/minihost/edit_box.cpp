@@ -1,0 +1,30 @@
+#include "keltext/minihost/edit_box.h"
+
+namespace kel::mini {
+
+std::vector<std::string> MiniEditBox::notifications() const {
+    return {"Change", "KeyDown", "KeyPress", "KeyUp", "Click", "DblClick", "GotFocus", "LostFocus", "MouseDown", "MouseUp"};
+}
+
+void MiniEditBox::MaxLength(int32_t v) {
+    if (v < 0) raise_error(kInvalidPropertyValue);
+    // A text already longer stays: the limit holds for what is typed from now on.
+    max_length_ = v;
+}
+
+void MiniEditBox::list_members(std::vector<std::string>& m) const {
+    EditFieldImpl::list_members(m);
+    m.push_back("MaxLength");
+}
+
+std::optional<Variant> MiniEditBox::peek_member(std::string_view m, std::optional<int32_t> index) const {
+    if (same_name(m, "MaxLength")) return no_index(index), Variant(max_length_);
+    return EditFieldImpl::peek_member(m, index);
+}
+
+bool MiniEditBox::poke_member(std::string_view m, const Variant& v, std::optional<int32_t> index) {
+    if (same_name(m, "MaxLength")) return no_index(index), MaxLength(to_int32(v)), true;
+    return EditFieldImpl::poke_member(m, v, index);
+}
+
+}  // namespace kel::mini

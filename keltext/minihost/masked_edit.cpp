@@ -1,0 +1,160 @@
+#include "keltext/minihost/masked_edit.h"
+
+namespace kel::mini {
+namespace {
+
+bool is_digit(uint8_t c) { return c >= '0' && c <= '9'; }
+
+// Letters of the single-byte set: ASCII and the accented letters.
+bool is_letter(uint8_t c) {
+    if ((c >= 'A' && c <= 'Z') || (c >= 'a' && c <= 'z')) return true;
+    switch (c) {
+    case 0x83: case 0x8A: case 0x8C: case 0x8E: case 0x9A: case 0x9C: case 0x9E: case 0x9F:
+    case 0xAA: case 0xB5: case 0xBA: return true;
+    default: return c >= 0xC0 && c != 0xD7 && c != 0xF7;
+    }
+}
+
+}  // namespace
+
+bool MiniMaskedEdit::is_input(char m) { return m == '#' || m == '?' || m == 'a' || m == '&'; }
+
+bool MiniMaskedEdit::fits(char ch, char m) {
+    auto c = static_cast<uint8_t>(ch);
+    switch (m) {
+    case '#': return is_digit(c);
+    case '?': return is_letter(c);
+    case 'a': return is_digit(c) || is_letter(c);
+    case '&': return c >= 32;
+    default: return false;
+    }
+}
+
+std::vector<std::string> MiniMaskedEdit::notifications() const {
+    return {"KeyDown", "KeyPress", "KeyUp", "Change", "GotFocus", "LostFocus"};
+}
+
+void MiniMaskedEdit::Text(const std::string& t) {
+    if (!mask_.empty()) {
+        bool shows = t.size() == mask_.size();
+        for (std::size_t i = 0; shows && i < t.size(); ++i) {
+            char m = mask_[i];
+            shows = is_input(m) ? (t[i] == kPrompt || fits(t[i], m)) : t[i] == m;
+        }
+        if (!shows) raise_error(kInvalidPropertyValue);
+    }
+    EditFieldImpl::Text(t);
+}
+
+void MiniMaskedEdit::Mask(const std::string& mask) {
+    mask_ = mask;
+    if (mask_.empty()) return;  // a plain edit box keeps the text as it stands
+    std::string laid(mask_.size(), kPrompt);
+    for (std::size_t i = 0; i < mask_.size(); ++i) {
+        char m = mask_[i];
+        if (!is_input(m))
+            laid[i] = m;
+        else if (i < text_.size() && fits(text_[i], m))
+            laid[i] = text_[i];
+    }
+    text_ = std::move(laid);
+    sel_start_ = std::min(sel_start_, length());
+    sel_length_ = 0;
+}
+
+bool MiniMaskedEdit::put_char(char c) {
+    int32_t pos = sel_start_;
+    while (pos < length() && !input_at(pos)) ++pos;
+    if (pos >= length() || !fits(c, mask_[static_cast<std::size_t>(pos)])) return false;
+    text_[static_cast<std::size_t>(pos)] = c;
+    ++pos;
+    while (pos < length() && !input_at(pos)) ++pos;
+    sel_start_ = pos;
+    sel_length_ = 0;
+    return true;
+}
+
+void MiniMaskedEdit::remove_at(int32_t pos) {
+    int32_t end = pos;
+    while (end < length() && input_at(end)) ++end;
+    for (int32_t i = pos; i + 1 < end; ++i) text_[static_cast<std::size_t>(i)] = text_[static_cast<std::size_t>(i + 1)];
+    text_[static_cast<std::size_t>(end - 1)] = kPrompt;
+}
+
+void MiniMaskedEdit::remove_selection() {
+    // From the end backwards, so that each removal leaves the positions before it in place.
+    for (int32_t p = sel_start_ + sel_length_ - 1; p >= sel_start_; --p)
+        if (input_at(p)) remove_at(p);
+    sel_length_ = 0;
+}
+
+void MiniMaskedEdit::type_run(std::string_view text) {
+    std::string before = text_;
+    if (sel_length_ > 0) remove_selection();
+    for (char c : text) put_char(c);
+    if (text_ != before) fire_change();
+}
+
+void MiniMaskedEdit::user_paste(std::string_view text) {
+    if (mask_.empty()) return EditFieldImpl::user_paste(text);
+    type_run(text);
+}
+
+void MiniMaskedEdit::set_sel_text(const std::string& t) {
+    if (mask_.empty()) return EditFieldImpl::set_sel_text(t);
+    type_run(t);
+}
+
+void MiniMaskedEdit::own_key_down(int16_t key_code, int16_t shift) {
+    if (mask_.empty() || key_code != kVkDelete) return EditFieldImpl::own_key_down(key_code, shift);
+    std::string before = text_;
+    if (sel_length_ > 0) {
+        remove_selection();
+    } else {
+        int32_t pos = sel_start_;
+        while (pos < length() && !input_at(pos)) ++pos;
+        if (pos >= length()) return;
+        remove_at(pos);
+        sel_start_ = pos;
+    }
+    if (text_ != before) fire_change();
+}
+
+void MiniMaskedEdit::own_key_press(int16_t char_code) {
+    if (mask_.empty()) return EditFieldImpl::own_key_press(char_code);
+    std::string before = text_;
+    if (char_code == 8) {
+        if (sel_length_ > 0) {
+            remove_selection();
+        } else {
+            int32_t pos = sel_start_ - 1;
+            while (pos >= 0 && !input_at(pos)) --pos;
+            if (pos < 0) return;
+            remove_at(pos);
+            sel_start_ = pos;
+        }
+    } else if (char_code >= 32 && char_code <= 255) {
+        // Typing overwrites the position; a selection only says where typing starts.
+        if (!put_char(static_cast<char>(static_cast<uint8_t>(char_code)))) return;
+    } else {
+        return;
+    }
+    if (text_ != before) fire_change();
+}
+
+void MiniMaskedEdit::list_members(std::vector<std::string>& m) const {
+    EditFieldImpl::list_members(m);
+    m.push_back("Mask");
+}
+
+std::optional<Variant> MiniMaskedEdit::peek_member(std::string_view m, std::optional<int32_t> index) const {
+    if (same_name(m, "Mask")) return no_index(index), Variant(mask_);
+    return EditFieldImpl::peek_member(m, index);
+}
+
+bool MiniMaskedEdit::poke_member(std::string_view m, const Variant& v, std::optional<int32_t> index) {
+    if (same_name(m, "Mask")) return no_index(index), Mask(text_of(v)), true;
+    return EditFieldImpl::poke_member(m, v, index);
+}
+
+}  // namespace kel::mini

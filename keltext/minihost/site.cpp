@@ -1,0 +1,146 @@
+#include "keltext/minihost/site.h"
+
+#include "keltext/host/conversions.h"
+#include "keltext/host/errors.h"
+#include "keltext/minihost/buttons.h"
+#include "keltext/minihost/edit_box.h"
+#include "keltext/minihost/list_widgets.h"
+#include "keltext/minihost/masked_edit.h"
+
+namespace kel::mini {
+namespace {
+
+// A by-reference argument the form's code changed goes back to the control in the kind the
+// control gave it; a value that cannot take that kind leaves the control's value.
+Variant coerce_like(const Variant& value, const Variant& given) {
+    try {
+        switch (given.kind()) {
+        case VarKind::Byte: return to_byte(value);
+        case VarKind::Int16: return to_int16(value);
+        case VarKind::Int32: return to_int32(value);
+        case VarKind::Single: return to_single(value);
+        case VarKind::Double: return to_double(value);
+        case VarKind::Boolean: return to_bool(value);
+        case VarKind::String: return text_of(value);
+        case VarKind::Date: return value.kind() == VarKind::Date ? value : given;
+        case VarKind::Object: return value.is_object() ? value : given;
+        case VarKind::Empty: return value;
+        }
+    } catch (const RuntimeError&) {
+    }
+    return given;
+}
+
+}  // namespace
+
+Dispatch& PagePart::selected_control(std::size_t i) {
+    if (i >= selected_.size()) raise_error(kInvalidPropertyIndex);
+    return selected_[i]->dispatch();
+}
+
+Variant PagePart::peek(std::string_view member, std::optional<int32_t> index) const {
+    no_index(index);
+    if (same_name(member, "Changed")) return changed_;
+    raise_error(kNoSuchMember);
+}
+
+void PagePart::poke(std::string_view member, const Variant& value, std::optional<int32_t> index) {
+    no_index(index);
+    if (same_name(member, "Changed")) return Changed(to_bool(value));
+    raise_error(kNoSuchMember);
+}
+
+MiniSite::MiniSite(FormServices& form, const ClassInfo& cls, std::string name, float width, float height,
+                   std::optional<std::vector<HostedControl*>> selected)
+    : form_(form),
+      info_(cls),
+      name_(std::move(name)),
+      surface_(form.next_handle(), width, height, [this] { raise_resize(); }) {
+    if (selected) page_ = std::make_unique<PagePart>(std::move(*selected));
+}
+
+MiniSite::~MiniSite() {
+    bound_.reset();
+    control_.reset();
+}
+
+void MiniSite::attach(std::unique_ptr<Control> control) {
+    control_ = std::move(control);
+    bound_ = std::make_unique<BoundControl>(*control_, info_);
+}
+
+Control& MiniSite::control() {
+    if (!control_) throw FormError("control " + name_ + " is not built");
+    return *control_;
+}
+
+Dispatch& MiniSite::dispatch() {
+    if (!bound_) throw FormError("control " + name_ + " is not built");
+    return *bound_;
+}
+
+void MiniSite::raise_resize() {
+    if (control_) guarded("surface", "Resize", [&] { control_->Resize(); });
+}
+
+void MiniSite::property_changed(std::string_view name) {
+    if (auto* o = form_.observer()) o->property_changed(*this, name);
+}
+
+void MiniSite::raise_event(int number, std::string_view name, std::span<EventArg> args) {
+    FormObserver* o = form_.observer();
+    if (!o) return;
+    std::vector<Variant> given;
+    given.reserve(args.size());
+    for (const auto& a : args) given.push_back(a.value);
+    o->event_raised(*this, number, name, args);
+    for (std::size_t i = 0; i < args.size(); ++i)
+        if (!(args[i].value == given[i])) args[i].value = coerce_like(args[i].value, given[i]);
+}
+
+void MiniSite::handler_error(std::string_view part, std::string_view notification, int number) {
+    if (auto* o = form_.observer()) o->handler_error(name_ + "." + std::string(part) + "." + std::string(notification), number);
+}
+
+template <class W>
+W& MiniSite::add_part(std::string_view name) {
+    auto w = std::make_unique<W>(*this, std::string(name), form_.next_handle(), surface_.Width(), surface_.Height());
+    W& ref = *w;
+    if (!keyboard_part_ && ref.is_edit_field()) keyboard_part_ = &ref;
+    parts_.emplace_back(std::string(name), std::move(w));
+    return ref;
+}
+
+EditBox& MiniSite::create_edit_box(std::string_view name) { return add_part<MiniEditBox>(name); }
+ComboBox& MiniSite::create_combo_box(std::string_view name) { return add_part<MiniComboBox>(name); }
+MaskedEdit& MiniSite::create_masked_edit(std::string_view name) { return add_part<MiniMaskedEdit>(name); }
+SpinButton& MiniSite::create_spin_button(std::string_view name) { return add_part<MiniSpinButton>(name); }
+Image& MiniSite::create_image(std::string_view name) { return add_part<MiniImage>(name); }
+ListBox& MiniSite::create_list_box(std::string_view name) { return add_part<MiniListBox>(name); }
+CheckBox& MiniSite::create_check_box(std::string_view name) { return add_part<MiniCheckBox>(name); }
+PushButton& MiniSite::create_push_button(std::string_view name) { return add_part<MiniPushButton>(name); }
+Label& MiniSite::create_label(std::string_view name) { return add_part<MiniLabel>(name); }
+Frame& MiniSite::create_frame(std::string_view name) { return add_part<MiniFrame>(name); }
+
+Part* MiniSite::part(std::string_view name) {
+    if (same_name(name, "surface")) return &surface_;
+    if (page_ && same_name(name, "page")) return page_.get();
+    for (auto& [n, p] : parts_)
+        if (same_name(n, name)) return p.get();
+    return nullptr;
+}
+
+std::vector<std::pair<std::string, Part*>> MiniSite::parts() {
+    std::vector<std::pair<std::string, Part*>> out;
+    out.reserve(parts_.size());
+    for (auto& [n, p] : parts_) out.emplace_back(n, p.get());
+    return out;
+}
+
+InputPart* MiniSite::input_part(Part* p) {
+    for (auto& [n, q] : parts_)
+        if (q.get() == p) return q.get();
+    return nullptr;
+}
+
+}  // namespace kel::mini
