@@ -1,0 +1,86 @@
+#include "apps/kelform/play.h"
+
+#include <cstdio>
+#include <iterator>
+#include <memory>
+#include <optional>
+#include <string>
+
+#include "apps/kelform/version.h"
+#include "keltext/library/catalogue.h"
+
+namespace kel::kelform {
+namespace {
+
+struct FileCloser {
+    void operator()(std::FILE* f) const { std::fclose(f); }
+};
+
+// The whole file, or nothing when it cannot be read (a directory opens but does not read).
+std::optional<std::string> read_file(const std::string& path) {
+    std::unique_ptr<std::FILE, FileCloser> f(std::fopen(path.c_str(), "rb"));
+    if (!f) return std::nullopt;
+    std::string text;
+    char buf[65536];
+    std::size_t n;
+    while ((n = std::fread(buf, 1, sizeof buf, f.get())) > 0) text.append(buf, n);
+    if (std::ferror(f.get())) return std::nullopt;
+    return text;
+}
+
+std::optional<std::string> read_stream(std::istream& in) {
+    std::string text{std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>()};
+    if (in.bad()) return std::nullopt;
+    return text;
+}
+
+}  // namespace
+
+int play(std::span<const std::string_view> scripts, std::span<const ClassInfo> classes, std::istream& in,
+         std::ostream& out, std::ostream& err, const PlayerSetup& setup) {
+    int status = 0;
+    for (std::string_view script : scripts) {
+        bool from_stdin = script == "-";
+        std::string name = from_stdin ? "<stdin>" : std::string(script);
+        std::optional<std::string> text = from_stdin ? read_stream(in) : read_file(name);
+        if (!text) {
+            out.flush();
+            err << name << ": cannot read the script\n";
+            status = 2;
+            continue;
+        }
+        Player player(classes, out);
+        if (setup) setup(player);
+        int s = player.run_script(*text, name, err);
+        if (s > status) status = s;
+    }
+    out.flush();
+    return status;
+}
+
+int play_command(std::span<const std::string_view> args, std::istream& in, std::ostream& out, std::ostream& err) {
+    if (args.empty()) {
+        err << "kelform play: no script given (usage: kelform play SCRIPT.kfs ...)\n";
+        return 2;
+    }
+    Catalogue catalogue;
+    return play(args, catalogue.classes(), in, out, err);
+}
+
+void print_usage(std::ostream& out) {
+    out << "usage: kelform                        open the demo form in the terminal\n"
+           "       kelform run FORM.kform         open a saved form in the terminal\n"
+           "       kelform play SCRIPT.kfs ...    run form scripts headless and print what happens\n"
+           "                                      ('-' reads the script from standard input)\n"
+           "       kelform --help                 show this help\n"
+           "       kelform --version              show the version\n"
+           "\n"
+           "commands:\n"
+           "  run   open a form file in the terminal\n"
+           "  play  run form scripts; exit status 0 when all ran and every expect held,\n"
+           "        1 when an expect failed, 2 when a script could not be read or has an error\n";
+}
+
+void print_version(std::ostream& out) { out << "kelform " << version() << '\n'; }
+
+}  // namespace kel::kelform
