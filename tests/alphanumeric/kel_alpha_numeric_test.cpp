@@ -1,0 +1,730 @@
+// KelAlphaNumeric on the minimal host: keystrokes as a person types them, properties as form
+// code sets them, and the property store as a form is saved and loaded.
+#include "keltext/alphanumeric/kel_alpha_numeric.h"
+
+#include <gtest/gtest.h>
+
+#include <functional>
+#include <string>
+#include <vector>
+
+#include "keltext/alphanumeric/class_info.h"
+#include "keltext/host/errors.h"
+#include "keltext/host/font.h"
+#include "keltext/minihost/form.h"
+#include "keltext/minihost/keyboard.h"
+
+namespace kel {
+namespace {
+
+using mini::Form;
+using mini::HostedControl;
+
+// Records what the control tells the form; `on_event` plays the form's code.
+struct Recorder : mini::FormObserver {
+    std::vector<std::string> events;
+    std::vector<std::string> keys;
+    std::vector<std::string> changed;
+    std::vector<std::string> errors;
+    std::function<void(std::string_view, std::span<EventArg>)> on_event;
+
+    void event_raised(HostedControl&, int number, std::string_view event, std::span<EventArg> args) override {
+        std::string line = std::to_string(number) + " " + std::string(event);
+        for (const EventArg& a : args) line += " " + std::string(a.name) + "=" + std::to_string(static_cast<long long>(a.value.number()));
+        events.push_back(line);
+        if (on_event) on_event(event, args);
+    }
+    void keys_sent(HostedControl&, std::string_view k) override { keys.emplace_back(k); }
+    void property_changed(HostedControl&, std::string_view p) override { changed.emplace_back(p); }
+    void handler_error(std::string_view where, int number) override {
+        errors.push_back(std::string(where) + " " + std::to_string(number));
+    }
+    bool saw(std::string_view event) const {
+        for (const auto& e : events)
+            if (e.find(event) != std::string::npos) return true;
+        return false;
+    }
+};
+
+class AlphaTest : public ::testing::Test {
+protected:
+    AlphaTest() : form(&rec), cls(kel_alpha_numeric_class()) {}
+
+    HostedControl& add(const std::string& name = "a") { return form.create(cls, name); }
+    KelAlphaNumeric& ctl(HostedControl& h) { return static_cast<KelAlphaNumeric&>(h.control()); }
+    Variant get(HostedControl& h, std::string_view prop) { return h.dispatch().get(prop); }
+    void set(HostedControl& h, std::string_view prop, const Variant& v) { h.dispatch().set(prop, v); }
+    Variant peek(HostedControl& h, std::string_view part, std::string_view member) {
+        return h.part(part)->peek(member);
+    }
+    void type(std::string_view text) {
+        for (char c : text) form.keystroke(mini::keystroke_for_char(static_cast<uint8_t>(c)));
+    }
+    void key(std::string_view name) { form.keystroke(*mini::parse_key(name)); }
+    std::string text(HostedControl& h) { return get(h, "Text").str(); }
+    int32_t caret(HostedControl& h) { return *peek(h, "TxtCustom", "SelStart").get_if<int32_t>(); }
+
+    Recorder rec;
+    Form form;
+    ClassInfo cls;
+};
+
+// ---- a new control ---------------------------------------------------------------------------
+
+TEST_F(AlphaTest, NewControlStartsWithTheDesignedValues) {
+    HostedControl& a = add();
+    struct Case {
+        const char* what;
+        Variant actual, expected;
+    } cases[] = {
+        {"TextType", get(a, "TextType"), Variant(int32_t{0})},
+        {"TextSelect", get(a, "TextSelect"), Variant(true)},
+        {"Enabled", get(a, "Enabled"), Variant(true)},
+        {"Locked", get(a, "Locked"), Variant(false)},
+        {"MaxLength", get(a, "MaxLength"), Variant(int32_t{0})},
+        {"Borderstyle", get(a, "Borderstyle"), Variant(int32_t{1})},
+        {"ForeColor", get(a, "ForeColor"), Variant(int32_t{0xC00000})},
+        {"BackColor", get(a, "BackColor"), Variant(int32_t{0xFFEFD0})},
+        {"MaxValue", get(a, "MaxValue"), Variant(int16_t{0})},
+        {"MinValue", get(a, "MinValue"), Variant(int16_t{0})},
+        {"Text", get(a, "Text"), Variant("")},
+        {"surface.Height", peek(a, "surface", "Height"), Variant(300.0f)},
+        {"surface.Width", peek(a, "surface", "Width"), Variant(1200.0f)},
+        {"surface.BackColor", peek(a, "surface", "BackColor"), Variant(int32_t{0xFFEFD0})},
+        {"surface.Enabled", peek(a, "surface", "Enabled"), Variant(true)},
+        {"TxtCustom.Left", peek(a, "TxtCustom", "Left"), Variant(1.0f)},
+        {"TxtCustom.Top", peek(a, "TxtCustom", "Top"), Variant(1.0f)},
+        {"TxtCustom.Height", peek(a, "TxtCustom", "Height"), Variant(300.0f)},
+        {"TxtCustom.Width", peek(a, "TxtCustom", "Width"), Variant(1190.0f)},
+    };
+    for (const Case& c : cases) EXPECT_EQ(c.actual, c.expected) << c.what;
+    const auto font = ctl(a).Font();
+    ASSERT_TRUE(font);
+    EXPECT_EQ(font->name, "Fixedsys");
+    EXPECT_EQ(font->size, 9);
+    EXPECT_TRUE(rec.changed.empty()) << "InitProperties announces nothing";
+}
+
+TEST_F(AlphaTest, HeightIsAlwaysThreeHundred) {
+    HostedControl& a = add();
+    form.resize(a, 2000, 900);
+    EXPECT_EQ(peek(a, "surface", "Height"), Variant(300.0f));
+    EXPECT_EQ(peek(a, "TxtCustom", "Width"), Variant(1990.0f));
+    // Narrower than the margin: the layout still succeeds.
+    form.resize(a, 4, 300);
+    EXPECT_EQ(peek(a, "TxtCustom", "Width"), Variant(0.0f));
+    EXPECT_TRUE(rec.errors.empty());
+}
+
+// ---- typing ---------------------------------------------------------------------------------------
+
+struct TypingCase {
+    int32_t type;
+    const char* typed;
+    const char* expected;
+};
+
+class Typing : public AlphaTest, public ::testing::WithParamInterface<TypingCase> {};
+
+TEST_P(Typing, FiltersAndShapes) {
+    const TypingCase& c = GetParam();
+    HostedControl& a = add();
+    set(a, "TextType", Variant(c.type));
+    form.focus(&a);
+    type(c.typed);
+    EXPECT_EQ(text(a), c.expected) << "type " << c.type << " typing '" << c.typed << "'";
+    EXPECT_EQ(caret(a), static_cast<int32_t>(std::string(c.expected).size()));
+}
+
+INSTANTIATE_TEST_SUITE_P(
+    AllTypes, Typing,
+    ::testing::Values(TypingCase{KelANDigits, "12a.3 -+4", "123 4"}, TypingCase{KelANDigits, "0509", "0509"},
+                      TypingCase{KelANUAlphaNumeric, "ab-1 c.@d", "AB1 CD"},
+                      TypingCase{KelANCommStyle, "a.b@c,(1)/[x]{y}-_&'#*", "ab@c(1)[x]{y}-_#*"},
+                      TypingCase{KelANUpperCase, "hello-1.x", "HELLO-1.X"},
+                      TypingCase{KelANSentence, "hello. world", "Hello. world"},
+                      TypingCase{KelANUserKeys, "x.Y!", "x.Y!"}, TypingCase{99, "x.Y!", "x.Y!"},
+                      TypingCase{KelANTitleCase, "john smith", "John Smith"},
+                      TypingCase{KelANTitleCase, "mary-ann o'neil", "Mary-ann O'neil"},
+                      TypingCase{KelANTitleCase, " x", " X"}, TypingCase{KelANTitleCase, "a  b", "A  B"}));
+
+TEST_F(AlphaTest, TitleCaseRaisesChangeOncePerCharacterInsideTheKeyPress) {
+    HostedControl& a = add();
+    form.focus(&a);
+    rec.events.clear();
+    type("j");
+    const std::vector<std::string> expected = {"4 KeyDown KeyCode=74 Shift=0", "5 KeyPress KeyAscii=106", "3 Change",
+                                               "6 KeyUp KeyCode=74 Shift=0"};
+    EXPECT_EQ(rec.events, expected);
+    EXPECT_EQ(text(a), "J");
+    EXPECT_EQ(caret(a), 1);
+}
+
+TEST_F(AlphaTest, TitleCaseAfterTextSetByCode) {
+    HostedControl& a = add();
+    set(a, "Text", Variant("john"));
+    form.focus(&a);
+    form.select(a, 4, 0);
+    type(" s");
+    EXPECT_EQ(text(a), "John S");
+    EXPECT_EQ(caret(a), 6);
+}
+
+TEST_F(AlphaTest, TitleCaseInsertsSpaceInsideWord) {
+    HostedControl& a = add();
+    set(a, "Text", Variant("Johnsmith"));
+    form.focus(&a);
+    form.select(a, 4, 0);
+    type(" ");
+    EXPECT_EQ(text(a), "John Smith");
+    EXPECT_EQ(caret(a), 5);
+}
+
+TEST_F(AlphaTest, TitleCaseFullBoxStepsOverTheFollowingCharacter) {
+    HostedControl& a = add();
+    set(a, "MaxLength", Variant(int16_t{5}));
+    set(a, "Text", Variant("Abcde"));
+    form.focus(&a);
+    form.select(a, 2, 0);
+    type("x");
+    EXPECT_EQ(text(a), "Abcde");
+    type("c");  // the character after the caret: the caret steps over it
+    EXPECT_EQ(text(a), "Abcde");
+    EXPECT_EQ(caret(a), 3);
+}
+
+TEST_F(AlphaTest, TitleCaseOverwrite) {
+    HostedControl& a = add();
+    set(a, "Text", Variant("Abc"));
+    form.focus(&a);
+    form.set_insert(true);
+    form.select(a, 1, 0);
+    type("x");
+    EXPECT_EQ(text(a), "Axc");
+    EXPECT_EQ(caret(a), 2);
+    set(a, "MaxLength", Variant(int16_t{3}));
+    form.select(a, 3, 0);
+    type("d");
+    EXPECT_EQ(text(a), "Axcd");
+}
+
+TEST_F(AlphaTest, TitleCaseSelectionReplacedBySpace) {
+    HostedControl& a = add();
+    set(a, "Text", Variant("Abcd"));
+    form.focus(&a);
+    form.select(a, 1, 2);
+    type(" ");
+    EXPECT_EQ(text(a), "A D");
+    EXPECT_EQ(caret(a), 2);
+}
+
+TEST_F(AlphaTest, OverwriteModeReplacesTheCharacterAfterTheCaret) {
+    struct Case {
+        int32_t type;
+        const char* start;
+        int32_t caret;
+        const char* typed;
+        const char* expected;
+    } cases[] = {
+        {KelANDigits, "123", 0, "9", "923"},       {KelANDigits, "123", 3, "4", "1234"},
+        {KelANUpperCase, "abc", 1, "x", "aXc"},    {KelANUAlphaNumeric, "ABC", 0, "zz", "ZZC"},
+        {KelANDigits, "123", 1, "x", "123"},       {KelANSentence, "abc", 0, "q", "Qbc"},
+        {KelANCommStyle, "a-b", 1, "_", "a_b"},
+    };
+    form.set_insert(true);
+    int n = 0;
+    for (const Case& c : cases) {
+        HostedControl& a = add("o" + std::to_string(n++));
+        set(a, "TextType", Variant(c.type));
+        set(a, "Text", Variant(c.start));
+        form.focus(&a);
+        form.select(a, c.caret, 0);
+        type(c.typed);
+        EXPECT_EQ(text(a), c.expected) << c.start << " typing " << c.typed;
+    }
+}
+
+TEST_F(AlphaTest, MaxLengthLimitsTypingButNotCode) {
+    HostedControl& a = add();
+    set(a, "TextType", Variant(int32_t{KelANUpperCase}));
+    set(a, "MaxLength", Variant(int16_t{3}));
+    form.focus(&a);
+    type("abcd");
+    EXPECT_EQ(text(a), "ABC");
+    set(a, "Text", Variant("longer text"));
+    EXPECT_EQ(text(a), "longer text");
+}
+
+// ---- the form's KeyPress and the dispatch ---------------------------------------------------------
+
+TEST_F(AlphaTest, FormMayChangeOrDropTheCharacter) {
+    HostedControl& a = add();
+    set(a, "TextType", Variant(int32_t{KelANDigits}));
+    form.focus(&a);
+    rec.on_event = [](std::string_view ev, std::span<EventArg> args) {
+        if (ev != "KeyPress") return;
+        if (args[0].value == Variant(int16_t{'x'})) args[0].value = Variant(int16_t{'7'});  // changed: filtered as 7
+        if (args[0].value == Variant(int16_t{'5'})) args[0].value = Variant(int16_t{0});    // dropped
+    };
+    type("1x5a2");
+    EXPECT_EQ(text(a), "172");
+}
+
+TEST_F(AlphaTest, DroppedKeyInTitleCaseAndOverwriteLeavesTheBoxAlone) {
+    struct Case {
+        int32_t type;
+    } cases[] = {{KelANTitleCase}, {KelANUpperCase}, {KelANSentence}};
+    form.set_insert(true);
+    rec.on_event = [](std::string_view ev, std::span<EventArg> args) {
+        if (ev == "KeyPress") args[0].value = Variant(int16_t{0});
+    };
+    int n = 0;
+    for (const Case& c : cases) {
+        HostedControl& a = add("d" + std::to_string(n++));
+        set(a, "TextType", Variant(c.type));
+        set(a, "Text", Variant("Abc"));
+        form.focus(&a);
+        form.select(a, 1, 0);
+        type("x");
+        EXPECT_EQ(text(a), "Abc") << c.type;
+        EXPECT_EQ(peek(a, "TxtCustom", "SelLength"), Variant(int32_t{0})) << c.type;
+        EXPECT_EQ(caret(a), 1) << c.type;
+    }
+}
+
+TEST_F(AlphaTest, EnterIsSeenByTheFormAndDropped) {
+    for (int32_t type_value : {0, 1, 2, 3, 4, 5, 6}) {
+        HostedControl& a = add("e" + std::to_string(type_value));
+        set(a, "TextType", Variant(type_value));
+        set(a, "Text", Variant("12"));
+        form.focus(&a);
+        form.select(a, 2, 0);
+        rec.events.clear();
+        key("Enter");
+        EXPECT_TRUE(rec.saw("KeyPress KeyAscii=13")) << type_value;
+        EXPECT_EQ(text(a), "12") << type_value;
+        key("Backspace");
+        EXPECT_EQ(text(a), "1") << "Backspace passes for type " << type_value;
+    }
+}
+
+TEST_F(AlphaTest, CtrlKeysBypassTheFilterAndTheFormsKeyPress) {
+    HostedControl& a = add();
+    set(a, "TextType", Variant(int32_t{KelANDigits}));
+    form.focus(&a);
+    rec.events.clear();
+    form.key_down(65, 2);
+    form.key_press('a');  // a character made with Ctrl held reaches the box unfiltered
+    form.key_up(65, 2);
+    EXPECT_EQ(text(a), "a");
+    EXPECT_FALSE(rec.saw("KeyPress"));
+    EXPECT_TRUE(rec.saw("KeyDown KeyCode=65 Shift=2"));
+    EXPECT_TRUE(rec.saw("KeyUp KeyCode=65 Shift=2"));
+}
+
+TEST_F(AlphaTest, UpAndDownMoveFocusUnlessCtrlIsHeld) {
+    HostedControl& a = add("a");
+    HostedControl& b = add("b");
+    HostedControl& c = add("c");
+    form.focus(&b);
+    key("Down");
+    EXPECT_EQ(form.focused(), &c);
+    key("Up");
+    EXPECT_EQ(form.focused(), &b);
+    key("Up");
+    EXPECT_EQ(form.focused(), &a);
+    key("Ctrl+Up");
+    key("Ctrl+Down");
+    EXPECT_EQ(form.focused(), &a);
+    const std::vector<std::string> sent = {"{TAB}", "+{TAB}", "+{TAB}"};
+    EXPECT_EQ(rec.keys, sent);
+}
+
+// ---- caret after a change ---------------------------------------------------------------------------
+
+TEST_F(AlphaTest, CaretAfterBackspaceAndDelete) {
+    HostedControl& a = add();
+    set(a, "TextType", Variant(int32_t{KelANUserKeys}));
+    set(a, "Text", Variant("abcdefg"));
+    form.focus(&a);
+
+    form.select(a, 3, 2);  // Backspace over a selection that starts at 3
+    key("Backspace");
+    EXPECT_EQ(text(a), "abcfg");
+    EXPECT_EQ(caret(a), 2);
+
+    form.select(a, 4, 0);  // Backspace alone: the caret stays where the character was
+    key("Backspace");
+    EXPECT_EQ(text(a), "abcg");
+    EXPECT_EQ(caret(a), 3);
+
+    form.select(a, 1, 0);  // Delete: where the edit box leaves it
+    key("Delete");
+    EXPECT_EQ(text(a), "acg");
+    EXPECT_EQ(caret(a), 1);
+
+    form.select(a, 0, 0);  // Backspace at the start changes nothing and fails nothing
+    key("Backspace");
+    EXPECT_EQ(text(a), "acg");
+    EXPECT_TRUE(rec.errors.empty());
+}
+
+TEST_F(AlphaTest, TextSetByCodeLeavesCaretAtZero) {
+    HostedControl& a = add();
+    set(a, "TextType", Variant(int32_t{KelANDigits}));
+    set(a, "Text", Variant(int16_t{123}));
+    EXPECT_EQ(get(a, "Text"), Variant("123"));
+    EXPECT_EQ(caret(a), 0);
+    set(a, "Text", Variant("abc!"));  // unfiltered
+    EXPECT_EQ(get(a, "Text"), Variant("abc!"));
+    EXPECT_TRUE(rec.saw("Change"));
+}
+
+TEST_F(AlphaTest, LongTextKeepsTheCaretRight) {
+    HostedControl& a = add();
+    set(a, "TextType", Variant(int32_t{KelANUpperCase}));
+    set(a, "Text", Variant(std::string(40000, 'A')));
+    form.focus(&a);
+    form.select(a, 39000, 0);
+    type("b");
+    EXPECT_EQ(caret(a), 39001);
+    EXPECT_EQ(text(a).substr(38999, 3), "ABA");
+    key("Backspace");
+    EXPECT_EQ(caret(a), 39000);
+}
+
+// ---- focus ---------------------------------------------------------------------------------------------
+
+TEST_F(AlphaTest, EnterFocusSelectsTheText) {
+    struct Case {
+        bool text_select;
+        const char* text;
+        int32_t sel_length;
+    } cases[] = {{true, "abc", 3}, {true, "", 0}, {false, "abc", 0}};
+    int n = 0;
+    for (const Case& c : cases) {
+        HostedControl& a = add("f" + std::to_string(n++));
+        set(a, "TextSelect", Variant(c.text_select));
+        set(a, "Text", Variant(c.text));
+        form.focus(nullptr);
+        form.focus(&a);
+        EXPECT_EQ(peek(a, "TxtCustom", "SelLength"), Variant(c.sel_length)) << c.text;
+        EXPECT_EQ(caret(a), 0);
+    }
+}
+
+struct ClampCase {
+    int32_t type;
+    Variant max, min;
+    const char* text;
+    const char* expected;
+};
+
+class DigitsClamp : public AlphaTest, public ::testing::WithParamInterface<ClampCase> {};
+
+TEST_P(DigitsClamp, WhenFocusLeaves) {
+    const ClampCase& c = GetParam();
+    HostedControl& a = add();
+    set(a, "TextType", Variant(c.type));
+    set(a, "MaxValue", c.max);
+    set(a, "MinValue", c.min);
+    set(a, "Text", Variant(c.text));
+    form.focus(&a);
+    form.focus(nullptr);
+    EXPECT_EQ(text(a), c.expected);
+}
+
+INSTANTIATE_TEST_SUITE_P(
+    Cases, DigitsClamp,
+    ::testing::Values(ClampCase{KelANDigits, Variant(int16_t{500}), Variant(int16_t{0}), "750", "500"},
+                      ClampCase{KelANDigits, Variant(int16_t{0}), Variant(int16_t{0}), "750", "750"},
+                      ClampCase{KelANDigits, Variant(int16_t{500}), Variant(int16_t{0}), "", ""},
+                      ClampCase{KelANDigits, Variant(int16_t{500}), Variant(int16_t{10}), "7", "10"},
+                      ClampCase{KelANDigits, Variant(int16_t{5}), Variant(int16_t{10}), "7", "10"},
+                      ClampCase{KelANDigits, Variant(int16_t{500}), Variant(int16_t{10}), "250", "250"},
+                      ClampCase{KelANDigits, Variant(int16_t{2000}), Variant(int16_t{0}), "1 500", "1 500"},
+                      ClampCase{KelANDigits, Variant(int16_t{1000}), Variant(int16_t{0}), "1 500", "1000"},
+                      // Limits given as text are compared by value and written back as given.
+                      ClampCase{KelANDigits, Variant("250"), Variant(int16_t{0}), "900", "250"},
+                      ClampCase{KelANDigits, Variant("1000"), Variant(int16_t{0}), "900", "900"},
+                      ClampCase{KelANDigits, Variant(2.5), Variant(int16_t{0}), "3", "2.5"},
+                      ClampCase{KelANDigits, Variant(int16_t{0}), Variant("50"), "9", "50"},
+                      ClampCase{KelANDigits, Variant("abc"), Variant(int16_t{0}), "900", "900"},
+                      ClampCase{KelANUpperCase, Variant(int16_t{5}), Variant(int16_t{0}), "99", "99"},
+                      ClampCase{KelANTitleCase, Variant(int16_t{5}), Variant(int16_t{50}), "9", "9"}));
+
+TEST_F(AlphaTest, ClampRaisesChange) {
+    HostedControl& a = add();
+    set(a, "TextType", Variant(int32_t{KelANDigits}));
+    set(a, "MaxValue", Variant(int16_t{5}));
+    set(a, "Text", Variant("9"));
+    form.focus(&a);
+    rec.events.clear();
+    form.focus(nullptr);
+    EXPECT_TRUE(rec.saw("Change"));
+}
+
+// ---- properties ----------------------------------------------------------------------------------------
+
+TEST_F(AlphaTest, LimitsKeepTheirKind) {
+    HostedControl& a = add();
+    struct Case {
+        Variant given, kept;
+    } cases[] = {
+        {Variant("250"), Variant("250")},        {Variant(int32_t{70000}), Variant(int32_t{70000})},
+        {Variant(2.5), Variant(2.5)},            {Variant("abc"), Variant(int16_t{0})},
+        {Variant(""), Variant(int16_t{0})},      {Variant(" 12 "), Variant(" 12 ")},
+    };
+    for (const Case& c : cases) {
+        set(a, "MaxValue", c.given);
+        EXPECT_EQ(get(a, "MaxValue"), c.kept);
+        set(a, "MinValue", c.given);
+        EXPECT_EQ(get(a, "MinValue"), c.kept);
+    }
+    EXPECT_TRUE(rec.changed.empty()) << "the limits are not announced";
+}
+
+TEST_F(AlphaTest, MaxLengthSetter) {
+    struct Case {
+        Variant given;
+        int32_t expected;
+        bool announced;
+    } cases[] = {
+        {Variant("abc"), 7, false},  {Variant("3.5"), 4, true},   {Variant("2.5"), 2, true},
+        {Variant(12.5), 12, true},   {Variant(13.5), 14, true},   {Variant(), 0, true},
+        {Variant(""), 7, false},     {Variant("."), 7, false},    {Variant(int16_t{-3}), 7, true},
+        {Variant(1e12), 7, true},    {Variant(" 9 "), 9, true},
+    };
+    for (const Case& c : cases) {
+        HostedControl& a = form.create(cls, "m" + std::to_string(&c - cases));
+        set(a, "MaxLength", Variant(int16_t{7}));
+        rec.changed.clear();
+        EXPECT_NO_THROW(set(a, "MaxLength", c.given));
+        EXPECT_EQ(get(a, "MaxLength"), Variant(c.expected)) << &c - cases;
+        EXPECT_EQ(!rec.changed.empty(), c.announced) << &c - cases;
+    }
+}
+
+TEST_F(AlphaTest, DesignTimeWidthFollowsMaxLength) {
+    struct Case {
+        bool running;
+        double font_size;
+        Variant max_length;
+        float width;
+    } cases[] = {
+        {false, 9, Variant(int16_t{10}), 1280},  {false, 9, Variant(int16_t{0}), 80},
+        {false, 9, Variant(int16_t{60}), 7280},  {false, 9, Variant(int16_t{61}), 1200},
+        {false, 9.5, Variant(int16_t{10}), 1280}, {false, 10, Variant(int16_t{10}), 1200},
+        {false, 12, Variant(int16_t{10}), 1200}, {true, 9, Variant(int16_t{10}), 1200},
+        {false, 9, Variant("abc"), 1200},        {false, 9, Variant(int16_t{-1}), 80},
+    };
+    int n = 0;
+    for (const Case& c : cases) {
+        form.set_user_mode(c.running);
+        HostedControl& a = add("w" + std::to_string(n++));
+        ctl(a).Font(std::make_shared<Font>("Fixedsys", c.font_size));
+        set(a, "MaxLength", c.max_length);
+        EXPECT_EQ(peek(a, "surface", "Width"), Variant(c.width)) << n - 1;
+        EXPECT_EQ(peek(a, "surface", "Height"), Variant(300.0f));
+    }
+}
+
+TEST_F(AlphaTest, LockedAndEnabledTheOneSetLastWins) {
+    HostedControl& a = add("a");
+    HostedControl& b = add("b");
+    set(a, "Locked", Variant(true));
+    EXPECT_EQ(peek(a, "surface", "Enabled"), Variant(false));
+    EXPECT_EQ(peek(a, "TxtCustom", "Enabled"), Variant(true));
+    EXPECT_EQ(get(a, "Locked"), Variant(true));
+    EXPECT_EQ(get(a, "Enabled"), Variant(true));
+    EXPECT_EQ(form.focus(&a), Form::FocusResult::refused);
+
+    set(a, "Enabled", Variant(true));  // enables the surface again; Locked stays true
+    EXPECT_EQ(peek(a, "surface", "Enabled"), Variant(true));
+    EXPECT_EQ(get(a, "Locked"), Variant(true));
+    rec.events.clear();
+    form.click(a, *a.part("TxtCustom"));
+    form.dbl_click(a, *a.part("TxtCustom"));
+    EXPECT_FALSE(rec.saw("Click")) << "a locked control raises no Click";
+
+    set(a, "Locked", Variant(false));
+    set(a, "Enabled", Variant(false));
+    EXPECT_EQ(peek(a, "TxtCustom", "Enabled"), Variant(false));
+    EXPECT_EQ(peek(a, "surface", "Enabled"), Variant(false));
+
+    set(b, "Enabled", Variant(true));
+    rec.events.clear();
+    form.click(b, *b.part("TxtCustom"));
+    form.dbl_click(b, *b.part("TxtCustom"));
+    const std::vector<std::string> expected = {"1 Click", "2 DblClick"};
+    EXPECT_EQ(rec.events, expected);
+}
+
+TEST_F(AlphaTest, SelectionMembers) {
+    HostedControl& a = add();
+    set(a, "Text", Variant("abcdef"));
+    set(a, "SelStart", Variant("x"));  // not numeric: nothing
+    EXPECT_EQ(get(a, "SelStart"), Variant(int32_t{0}));
+    set(a, "SelStart", Variant(int16_t{2}));
+    set(a, "Sellength", Variant("3"));
+    EXPECT_EQ(get(a, "SelStart"), Variant(int32_t{2}));
+    EXPECT_EQ(get(a, "Sellength"), Variant(int32_t{3}));
+    EXPECT_EQ(get(a, "SelText"), Variant("cde"));
+    set(a, "Sellength", Variant("nope"));
+    EXPECT_EQ(get(a, "Sellength"), Variant(int32_t{3}));
+    try {
+        set(a, "SelStart", Variant(int16_t{-1}));
+        ADD_FAILURE() << "a negative caret is the edit box's error";
+    } catch (const RuntimeError& e) {
+        EXPECT_EQ(e.number(), 380);
+    }
+    try {
+        set(a, "SelText", Variant("x"));
+        ADD_FAILURE() << "SelText is read only";
+    } catch (const RuntimeError& e) {
+        EXPECT_EQ(e.number(), 438);
+    }
+    EXPECT_TRUE(rec.changed.size() == 1 && rec.changed[0] == "Text") << "selection members are not announced";
+}
+
+TEST_F(AlphaTest, SettersAnnounceTheirNames) {
+    HostedControl& a = add();
+    set(a, "TextType", Variant(int32_t{3}));
+    set(a, "Locked", Variant(false));
+    set(a, "Borderstyle", Variant(int16_t{0}));
+    set(a, "Text", Variant("x"));
+    set(a, "BackColor", Variant(int32_t{0xFF}));
+    set(a, "ForeColor", Variant(int32_t{0xFF00}));
+    set(a, "Font", Variant(std::make_shared<Font>("Arial", 12)));
+    set(a, "MaxLength", Variant(int16_t{4}));
+    set(a, "Enabled", Variant(true));
+    set(a, "TextSelect", Variant(false));
+    const std::vector<std::string> expected = {"TextType",  "Locked",    "BorderStyle", "Text",    "BackColor",
+                                               "ForeColor", "Font",      "MaxLength",   "Enabled", "TextSelect"};
+    EXPECT_EQ(rec.changed, expected);
+    EXPECT_EQ(peek(a, "surface", "BackColor"), Variant(int32_t{0xFF}));
+    EXPECT_EQ(peek(a, "TxtCustom", "ForeColor"), Variant(int32_t{0xFF00}));
+    EXPECT_EQ(font_of(peek(a, "TxtCustom", "Font"))->name, "Arial");
+    EXPECT_EQ(peek(a, "surface", "BorderStyle"), Variant(int16_t{0}));
+}
+
+TEST_F(AlphaTest, BorderstyleErrors) {
+    HostedControl& a = add();
+    struct Case {
+        Variant value;
+        int error;
+    } cases[] = {{Variant(int32_t{70000}), 6}, {Variant(int16_t{2}), 380}, {Variant(int16_t{-1}), 380},
+                 {Variant("x"), 13}};
+    for (const Case& c : cases) {
+        try {
+            set(a, "Borderstyle", c.value);
+            ADD_FAILURE() << "no error for " << c.value.number();
+        } catch (const RuntimeError& e) {
+            EXPECT_EQ(e.number(), c.error);
+        }
+        EXPECT_EQ(get(a, "Borderstyle"), Variant(int32_t{1}));
+    }
+}
+
+TEST_F(AlphaTest, HandleIsTheSurfacesAndRefreshRepaintsIt) {
+    HostedControl& a = add();
+    EXPECT_EQ(get(a, "hWnd"), peek(a, "surface", "hWnd"));
+    EXPECT_NE(get(a, "hWnd"), peek(a, "TxtCustom", "hWnd"));
+    a.dispatch().call("Refresh", {});
+    EXPECT_EQ(peek(a, "surface", "RefreshCount"), Variant(int32_t{1}));
+}
+
+// ---- persistence ----------------------------------------------------------------------------------------
+
+TEST_F(AlphaTest, NewControlSavesOnlyItsFont) {
+    HostedControl& a = add();
+    const mini::StoredValues saved = form.save(a);
+    ASSERT_EQ(saved.size(), 1u);
+    EXPECT_EQ(saved[0].first, "Font");
+}
+
+TEST_F(AlphaTest, LoadingAnEmptyStoreGivesANewControl) {
+    HostedControl& a = form.load(cls, "a", {});
+    EXPECT_EQ(get(a, "TextType"), Variant(int32_t{0}));
+    EXPECT_EQ(get(a, "TextSelect"), Variant(true));
+    EXPECT_EQ(get(a, "Enabled"), Variant(true));
+    EXPECT_EQ(get(a, "Locked"), Variant(false));
+    EXPECT_EQ(get(a, "Borderstyle"), Variant(int32_t{1}));
+    EXPECT_EQ(get(a, "ForeColor"), Variant(int32_t{0xC00000}));
+    EXPECT_EQ(get(a, "BackColor"), Variant(int32_t{0xFFEFD0}));
+    EXPECT_EQ(peek(a, "surface", "BackColor"), Variant(int32_t{0xFFEFD0}));
+    EXPECT_EQ(peek(a, "surface", "Height"), Variant(300.0f));
+    EXPECT_EQ(form.save(a).size(), 1u);
+}
+
+TEST_F(AlphaTest, SaveWritesInOrderWithItsOwnSpellings) {
+    HostedControl& a = add();
+    set(a, "TextType", Variant(int32_t{4}));
+    set(a, "Borderstyle", Variant(int16_t{0}));
+    set(a, "ForeColor", Variant(int32_t{0x123456}));
+    set(a, "BackColor", Variant(int32_t{0x00FF00}));
+    set(a, "MaxLength", Variant(int16_t{8}));
+    set(a, "Text", Variant("4711"));
+    set(a, "Enabled", Variant(false));
+    set(a, "Locked", Variant(true));
+    set(a, "TextSelect", Variant(false));
+    const mini::StoredValues saved = form.save(a);
+    std::vector<std::string> keys;
+    for (const auto& [k, v] : saved) keys.push_back(k);
+    const std::vector<std::string> expected = {"BorderStyle", "TextType", "Forecolor", "Backcolor", "Font",
+                                               "MaxLength",   "Text",     "Locked",    "Enabled",   "TextSelect"};
+    EXPECT_EQ(keys, expected);
+    EXPECT_EQ(saved[0].second, Variant(int16_t{0}));
+    EXPECT_EQ(saved[1].second, Variant(int32_t{4}));
+    EXPECT_EQ(saved[3].second, Variant(int32_t{0x00FF00}));
+    EXPECT_EQ(saved[5].second, Variant(int32_t{8}));
+
+    // Loading it back gives the same control; the back colour comes in through "BackColor".
+    HostedControl& b = form.load(cls, "b", saved);
+    for (const char* p : {"TextType", "Borderstyle", "ForeColor", "BackColor", "MaxLength", "Text", "Enabled",
+                          "Locked", "TextSelect"})
+        EXPECT_EQ(get(b, p), get(a, p)) << p;
+    EXPECT_EQ(peek(b, "surface", "BackColor"), Variant(int32_t{0x00FF00}));
+    // Locked was loaded last: the surface is disabled, the edit box follows Enabled.
+    EXPECT_EQ(peek(b, "surface", "Enabled"), Variant(false));
+    EXPECT_EQ(peek(b, "TxtCustom", "Enabled"), Variant(false));
+    const mini::StoredValues again = form.save(b);
+    ASSERT_EQ(again.size(), saved.size());
+    for (std::size_t i = 0; i < saved.size(); ++i) {
+        EXPECT_EQ(again[i].first, saved[i].first);
+        if (saved[i].first != "Font") {
+            EXPECT_EQ(again[i].second, saved[i].second) << saved[i].first;
+        }
+    }
+}
+
+TEST_F(AlphaTest, LoadMatchesKeysWithoutRegardToCaseAndSkipsBadValues) {
+    HostedControl& a = form.load(cls, "a",
+                                 {{"FORECOLOR", Variant(int32_t{0xFF})},
+                                  {"backcolor", Variant(int32_t{0x00FF00})},
+                                  {"BorderStyle", Variant(int16_t{7})},
+                                  {"TextType", Variant("abc")},
+                                  {"MaxLength", Variant(int16_t{-4})},
+                                  {"Font", Variant("not a font")},
+                                  {"Text", Variant(int16_t{42})},
+                                  {"Locked", Variant("True")}});
+    EXPECT_EQ(get(a, "ForeColor"), Variant(int32_t{0xFF}));
+    EXPECT_EQ(get(a, "BackColor"), Variant(int32_t{0x00FF00}));
+    EXPECT_NE(get(a, "Borderstyle"), Variant(int32_t{7}));
+    EXPECT_EQ(get(a, "TextType"), Variant(int32_t{0}));
+    EXPECT_EQ(get(a, "MaxLength"), Variant(int32_t{0}));
+    EXPECT_EQ(ctl(a).Font()->name, "Fixedsys");
+    EXPECT_EQ(get(a, "Text"), Variant("42"));
+    EXPECT_EQ(get(a, "Locked"), Variant(true));
+    EXPECT_TRUE(rec.errors.empty());
+}
+
+TEST_F(AlphaTest, LoadedTextRunsTheChangePath) {
+    rec.events.clear();
+    HostedControl& a = form.load(cls, "a", {{"Text", Variant("hello")}});
+    EXPECT_TRUE(rec.saw("3 Change"));
+    EXPECT_EQ(text(a), "hello");
+}
+
+}  // namespace
+}  // namespace kel
