@@ -1,0 +1,443 @@
+#include "apps/kelform/form_file.h"
+
+#include <charconv>
+#include <cmath>
+#include <cstdio>
+#include <fstream>
+#include <limits>
+#include <sstream>
+#include <system_error>
+
+#include "apps/kelform/script_syntax.h"
+#include "keltext/host/charset.h"
+#include "keltext/host/conversions.h"
+#include "keltext/host/font.h"
+#include "keltext/host/errors.h"
+
+namespace kel::kelform {
+
+FormFileError::FormFileError(std::string file, int line, const std::string& message)
+    : std::runtime_error(line > 0 ? file + ":" + std::to_string(line) + ": " + message : file + ": " + message),
+      file_(std::move(file)),
+      line_(line),
+      message_(message) {}
+
+namespace {
+
+constexpr int kMaxCell = 999;            // rows and columns a form may use
+constexpr float kMaxTwips = 1000000.0f;  // far beyond any screen
+
+std::optional<int> parse_cell(std::string_view s) {
+    int v = 0;
+    const auto [end, ec] = std::from_chars(s.data(), s.data() + s.size(), v);
+    if (ec != std::errc() || end != s.data() + s.size() || v < 1 || v > kMaxCell) return std::nullopt;
+    return v;
+}
+
+std::optional<float> parse_twips(std::string_view s) {
+    if (s.empty() || !((s[0] >= '0' && s[0] <= '9') || s[0] == '.')) return std::nullopt;
+    float v = 0;
+    const auto [end, ec] = std::from_chars(s.data(), s.data() + s.size(), v);
+    if (ec != std::errc() || end != s.data() + s.size() || !(v > 0) || v > kMaxTwips) return std::nullopt;
+    return v;
+}
+
+std::string float_text(float v) {
+    char buf[32];
+    const auto r = std::to_chars(buf, buf + sizeof buf, v);
+    return std::string(buf, r.ptr);
+}
+
+class Parser {
+public:
+    Parser(const std::string& file, const Catalogue& catalogue) : file_(file), catalogue_(catalogue) {}
+
+    FormSpec parse(std::string_view text) {
+        int line_no = 0;
+        std::size_t pos = 0;
+        while (pos <= text.size()) {
+            const std::size_t nl = text.find('\n', pos);
+            std::string_view line = text.substr(pos, nl == std::string_view::npos ? std::string_view::npos : nl - pos);
+            if (!line.empty() && line.back() == '\r') line.remove_suffix(1);
+            ++line_no;
+            statement(line, line_no);
+            if (nl == std::string_view::npos) break;
+            pos = nl + 1;
+        }
+        if (current_) fail(current_->line, "control '" + current_->name + "' has no 'end'");
+        if (!have_form_) fail(line_no, "the file has no 'form' line");
+        spec_.trailing_comments = std::move(pending_comments_);
+        return std::move(spec_);
+    }
+
+private:
+    [[noreturn]] void fail(int line, const std::string& message) const { throw FormFileError(file_, line, message); }
+
+    void statement(std::string_view line, int line_no) {
+        std::vector<std::string_view> words;
+        try {
+            words = split_words(line);
+        } catch (const ScriptError& e) {
+            fail(line_no, e.what());
+        }
+        if (words.empty()) {
+            // Keep comment lines (not blank ones) so that saving the form keeps them.
+            const auto first = line.find_first_not_of(" \t");
+            if (first != std::string_view::npos && line[first] == '#') pending_comments_.emplace_back(line.substr(first));
+            return;
+        }
+        const std::string keyword(words[0]);
+        const auto args = std::span<const std::string_view>(words).subspan(1);
+        if (keyword == "form") return form_line(args, line_no);
+        if (keyword == "control") return control_line(args, line_no);
+        if (!current_) {
+            if (keyword == "end" || keyword == "label" || keyword == "at" || keyword == "size" || keyword == "store" ||
+                keyword == "set")
+                fail(line_no, "'" + keyword + "' outside a control");
+            fail(line_no, "unknown statement '" + shown(keyword) + "'");
+        }
+        if (keyword == "end") return end_line(args, line_no);
+        if (keyword == "label") return label_line(args, line_no);
+        if (keyword == "at") return at_line(args, line_no);
+        if (keyword == "size") return size_line(args, line_no);
+        if (keyword == "store") return store_line(args, line_no);
+        if (keyword == "set") return set_line(args, line_no);
+        fail(line_no, "unknown statement '" + shown(keyword) + "'");
+    }
+
+    std::string string_arg(std::string_view w, int line_no, const char* what) const {
+        if (!is_string_literal(w)) fail(line_no, std::string(what) + " must be a quoted string");
+        try {
+            return decode_string(w);
+        } catch (const ScriptError& e) {
+            fail(line_no, e.what());
+        }
+    }
+
+    Variant value_arg(std::string_view w, int line_no) const {
+        try {
+            return parse_value(w);
+        } catch (const ScriptError& e) {
+            fail(line_no, e.what());
+        }
+    }
+
+    void form_line(std::span<const std::string_view> args, int line_no) {
+        if (have_form_) fail(line_no, "a second 'form' line");
+        if (current_) fail(line_no, "'form' inside control '" + current_->name + "'");
+        if (args.size() != 1) fail(line_no, "'form' takes the form's title as one quoted string");
+        spec_.title = string_arg(args[0], line_no, "the title");
+        spec_.comments = std::move(pending_comments_);
+        pending_comments_.clear();
+        have_form_ = true;
+    }
+
+    void control_line(std::span<const std::string_view> args, int line_no) {
+        if (!have_form_) fail(line_no, "the file must begin with a 'form' line");
+        if (current_) fail(line_no, "control '" + current_->name + "' (line " + std::to_string(current_->line) +
+                                        ") has no 'end' before the next control");
+        if (args.size() != 2) fail(line_no, "'control' takes a class and a name");
+        const ClassInfo* cls = catalogue_.find(args[0]);
+        if (!cls) fail(line_no, "unknown class '" + shown(args[0]) + "'");
+        if (cls->is_page) fail(line_no, "'" + cls->name + "' is a property page, not a control");
+        const std::string name(args[1]);
+        if (!is_name(name)) fail(line_no, "'" + shown(name) + "' is not a name (letters, digits and _)");
+        for (const ControlSpec& c : spec_.controls)
+            if (same_name(c.name, name))
+                fail(line_no, "a control named '" + c.name + "' is already on the form (line " +
+                                  std::to_string(c.line) + ")");
+        current_.emplace();
+        current_->class_name = cls->name;
+        current_->name = name;
+        current_->line = line_no;
+        current_class_ = cls;
+        current_->comments = std::move(pending_comments_);
+        pending_comments_.clear();
+        seen_at_ = false;
+    }
+
+    void end_line(std::span<const std::string_view> args, int line_no) {
+        if (!args.empty()) fail(line_no, "'end' takes nothing after it");
+        if (!seen_at_) fail(line_no, "control '" + current_->name + "' has no 'at' line (its place on the form)");
+        // Comments inside the block are written back before it.
+        for (auto& c : pending_comments_) current_->comments.push_back(std::move(c));
+        pending_comments_.clear();
+        spec_.controls.push_back(std::move(*current_));
+        current_.reset();
+        current_class_ = nullptr;
+    }
+
+    void label_line(std::span<const std::string_view> args, int line_no) {
+        if (args.size() != 1 && !(args.size() == 4 && args[1] == "at"))
+            fail(line_no, "'label' takes a quoted text, optionally followed by 'at ROW COLUMN'");
+        current_->label = string_arg(args[0], line_no, "the label");
+        if (args.size() == 4) {
+            const auto r = parse_cell(args[2]), c = parse_cell(args[3]);
+            if (!r || !c) fail(line_no, "row and column are whole numbers from 1 to " + std::to_string(kMaxCell));
+            current_->label_row = *r;
+            current_->label_col = *c;
+        }
+    }
+
+    void at_line(std::span<const std::string_view> args, int line_no) {
+        if (args.size() != 2) fail(line_no, "'at' takes a row and a column");
+        const auto r = parse_cell(args[0]), c = parse_cell(args[1]);
+        if (!r || !c) fail(line_no, "row and column are whole numbers from 1 to " + std::to_string(kMaxCell));
+        current_->row = *r;
+        current_->col = *c;
+        seen_at_ = true;
+    }
+
+    void size_line(std::span<const std::string_view> args, int line_no) {
+        if (args.size() != 2) fail(line_no, "'size' takes a width and a height in twips");
+        const auto w = parse_twips(args[0]), h = parse_twips(args[1]);
+        if (!w || !h) fail(line_no, "width and height are numbers of twips above 0");
+        current_->width = *w;
+        current_->height = *h;
+    }
+
+    void store_line(std::span<const std::string_view> args, int line_no) {
+        if (args.size() != 2) fail(line_no, "'store' takes a key and a value");
+        const std::string key(args[0]);
+        if (!is_name(key)) fail(line_no, "'" + shown(key) + "' is not a key (letters, digits and _)");
+        for (const auto& [k, v] : current_->stored)
+            if (same_name(k, key)) fail(line_no, "'" + key + "' is stored twice");
+        current_->stored.emplace_back(key, value_arg(args[1], line_no));
+    }
+
+    void set_line(std::span<const std::string_view> args, int line_no) {
+        if (args.size() != 2) fail(line_no, "'set' takes a property and a value");
+        const PropertyInfo* p = current_class_->find_property(args[0]);
+        if (!p) fail(line_no, current_class_->name + " has no property '" + shown(args[0]) + "'");
+        if (p->read_only()) fail(line_no, current_class_->name + "." + p->name + " is read-only");
+        if (p->indexed) fail(line_no, current_class_->name + "." + p->name + " takes an index");
+        // The date words are checked here with any day: only their spelling can be wrong.
+        try {
+            setting_value(args[1], Date{});
+        } catch (const ScriptError& e) {
+            fail(line_no, e.what());
+        }
+        current_->settings.push_back({p->name, std::string(args[1]), line_no});
+    }
+
+    const std::string& file_;
+    const Catalogue& catalogue_;
+    FormSpec spec_;
+    bool have_form_ = false;
+    bool seen_at_ = false;
+    std::optional<ControlSpec> current_;
+    const ClassInfo* current_class_ = nullptr;
+    std::vector<std::string> pending_comments_;
+};
+
+}  // namespace
+
+std::string string_literal(std::string_view s) {
+    static constexpr char kHex[] = "0123456789ABCDEF";
+    std::string out = "\"";
+    for (char c : s) {
+        const auto b = static_cast<unsigned char>(c);
+        if (c == '"' || c == '\\') {
+            out += '\\';
+            out += c;
+        } else if (c == '\t') {
+            out += "\\t";
+        } else if (c == '\n') {
+            out += "\\n";
+        } else if (c == '\r') {
+            out += "\\r";
+        } else if (b < 0x20 || b >= 0x7F) {
+            out += "\\x";
+            out += kHex[b >> 4];
+            out += kHex[b & 15];
+        } else {
+            out += c;
+        }
+    }
+    return out + "\"";
+}
+
+namespace {
+
+std::string shortest_text(double v) {
+    char buf[64];
+    const auto r = std::to_chars(buf, buf + sizeof buf, v);
+    return std::string(buf, r.ptr);
+}
+
+std::string double_literal(double v) {
+    const std::string text = shortest_text(v);
+    // A bare literal without a point or exponent would read back as an integer.
+    const bool reads_as_double = text.find('.') != std::string::npos && text.find('e') == std::string::npos;
+    return reads_as_double ? text : "f64:" + text;
+}
+
+bool names_colour(std::string_view key) {
+    const std::string upper = upper_case(key);
+    return upper.find("COLOR") != std::string::npos || upper.find("COLOUR") != std::string::npos;
+}
+
+}  // namespace
+
+std::string value_literal(const Variant& v, std::string_view key) {
+    switch (v.kind()) {
+        case VarKind::Empty: return "empty";
+        case VarKind::Boolean: return *v.get_if<bool>() ? "true" : "false";
+        case VarKind::Byte: return "u8:" + std::to_string(*v.get_if<uint8_t>());
+        case VarKind::Int16: return std::to_string(*v.get_if<int16_t>());
+        case VarKind::Int32: {
+            const int32_t n = *v.get_if<int32_t>();
+            if (names_colour(key)) {
+                char buf[16];
+                std::snprintf(buf, sizeof buf, "0x%06X", static_cast<uint32_t>(n));
+                return buf;
+            }
+            if (n >= std::numeric_limits<int16_t>::min() && n <= std::numeric_limits<int16_t>::max())
+                return "i32:" + std::to_string(n);
+            return std::to_string(n);
+        }
+        case VarKind::Single: return "f32:" + float_text(*v.get_if<float>());
+        case VarKind::Double: return double_literal(*v.get_if<double>());
+        case VarKind::Date: {
+            const Ymd d = to_ymd(*v.get_if<Date>());
+            char buf[32];
+            std::snprintf(buf, sizeof buf, "date:%04d-%02d-%02d", d.year, d.month, d.day);
+            return buf;
+        }
+        case VarKind::String: return string_literal(v.str());
+        case VarKind::Object: {
+            if (const auto f = font_of(v)) {
+                std::string out = "font:" + string_literal(f->name) + ":" + shortest_text(f->size);
+                if (f->bold) out += ":bold";
+                if (f->italic) out += ":italic";
+                return out;
+            }
+            return "empty";
+        }
+    }
+    return "empty";
+}
+
+FormSpec parse_form(std::string_view text, const std::string& file, const Catalogue& catalogue) {
+    return Parser(file, catalogue).parse(text);
+}
+
+FormSpec read_form_file(const std::string& path, const Catalogue& catalogue) {
+    std::ifstream in(path, std::ios::binary);
+    if (!in) throw FormFileError(path, 0, "cannot open the file");
+    std::ostringstream text;
+    text << in.rdbuf();
+    if (in.bad()) throw FormFileError(path, 0, "cannot read the file");
+    return parse_form(text.str(), path, catalogue);
+}
+
+std::string write_form(const FormSpec& form) {
+    std::string out;
+    for (const auto& c : form.comments) out += c + "\n";
+    out += "form " + string_literal(form.title) + "\n";
+    for (const ControlSpec& c : form.controls) {
+        out += "\n";
+        for (const auto& note : c.comments) out += note + "\n";
+        out += "control " + c.class_name + " " + c.name + "\n";
+        if (!c.label.empty() || c.label_row) {
+            out += "    label " + string_literal(c.label);
+            if (c.label_row && c.label_col)
+                out += " at " + std::to_string(*c.label_row) + " " + std::to_string(*c.label_col);
+            out += "\n";
+        }
+        out += "    at " + std::to_string(c.row) + " " + std::to_string(c.col) + "\n";
+        out += "    size " + float_text(c.width) + " " + float_text(c.height) + "\n";
+        for (const auto& [key, value] : c.stored) out += "    store " + key + " " + value_literal(value, key) + "\n";
+        for (const auto& s : c.settings) out += "    set " + s.property + " " + s.value + "\n";
+        out += "end\n";
+    }
+    if (!form.trailing_comments.empty()) {
+        out += "\n";
+        for (const auto& c : form.trailing_comments) out += c + "\n";
+    }
+    return out;
+}
+
+void write_form_file(const std::string& path, const FormSpec& form) {
+    const std::string text = write_form(form);
+    const std::string temp = path + ".saving";
+    {
+        std::ofstream out(temp, std::ios::binary | std::ios::trunc);
+        if (!out) throw FormFileError(path, 0, "cannot write the file");
+        out << text;
+        out.flush();
+        if (!out) {
+            std::remove(temp.c_str());
+            throw FormFileError(path, 0, "cannot write the file");
+        }
+    }
+    if (std::rename(temp.c_str(), path.c_str()) != 0) {
+        std::remove(temp.c_str());
+        throw FormFileError(path, 0, "cannot replace the file");
+    }
+}
+
+Date financial_year_start(Date day) {
+    const Ymd d = to_ymd(day);
+    const int year = d.month >= 4 ? d.year : d.year - 1;
+    return make_date(year, 4, 1).value_or(day);
+}
+
+Date financial_year_end(Date day) {
+    const Ymd d = to_ymd(day);
+    const int year = d.month >= 4 ? d.year + 1 : d.year;
+    return make_date(year, 3, 31).value_or(day);
+}
+
+Variant setting_value(std::string_view literal, Date today) {
+    if (literal == "today") return Variant(today);
+    if (literal == "fy-start") return Variant(financial_year_start(today));
+    if (literal == "fy-end") return Variant(financial_year_end(today));
+    return parse_value(literal);
+}
+
+void open_form(mini::Form& form, const FormSpec& spec, const Catalogue& catalogue, const std::string& file,
+               Date today) {
+    for (const ControlSpec& c : spec.controls) {
+        const ClassInfo* cls = catalogue.find(c.class_name);
+        if (!cls) throw FormFileError(file, c.line, "unknown class '" + c.class_name + "'");
+        try {
+            // The form then places the control at its size, as a container lays out a loaded
+            // form: some controls set their own width while they read their properties.
+            mini::HostedControl& hosted = form.load(*cls, c.name, c.stored, c.width, c.height);
+            form.resize(hosted, c.width, c.height);
+        } catch (const RuntimeError& e) {
+            throw FormFileError(file, c.line, c.name + " could not load its stored values: error " +
+                                                  std::to_string(e.number()) + " (" + e.what() + ")");
+        } catch (const mini::FormError& e) {
+            throw FormFileError(file, c.line, e.what());
+        }
+    }
+    for (const ControlSpec& c : spec.controls) {
+        mini::HostedControl* hosted = form.find(c.name);
+        if (!hosted) continue;
+        for (const OpenSetting& s : c.settings) {
+            Variant value;
+            try {
+                value = setting_value(s.value, today);
+            } catch (const ScriptError& e) {
+                throw FormFileError(file, s.line, e.what());
+            }
+            try {
+                hosted->dispatch().set(s.property, value);
+            } catch (const RuntimeError& e) {
+                throw FormFileError(file, s.line, c.name + "." + s.property + " -> error " +
+                                                      std::to_string(e.number()) + " (" + e.what() + ")");
+            }
+        }
+    }
+}
+
+FormSpec capture_form(mini::Form& form, const FormSpec& spec) {
+    FormSpec out = spec;
+    for (ControlSpec& c : out.controls)
+        if (mini::HostedControl* hosted = form.find(c.name)) c.stored = form.save(*hosted);
+    return out;
+}
+
+}  // namespace kel::kelform

@@ -1,0 +1,103 @@
+#pragma once
+// Form files (.kform): a saved form as plain text that a person can read and edit. Each
+// control keeps its class, name, label, place on the screen, the size the form gives it, the
+// values its WriteProperties stored (exactly those, so that ReadProperties reads them back),
+// and the settings the form's code makes when the form opens. docs/kelform.md describes the
+// format.
+#include <optional>
+#include <stdexcept>
+#include <string>
+#include <string_view>
+#include <vector>
+
+#include "keltext/host/date.h"
+#include "keltext/host/variant.h"
+#include "keltext/library/catalogue.h"
+#include "keltext/minihost/form.h"
+
+namespace kel::kelform {
+
+// A form file that cannot be read: the message names the file and the line
+// ("voucher.kform:12: unknown statement 'foo'").
+class FormFileError : public std::runtime_error {
+public:
+    FormFileError(std::string file, int line, const std::string& message);
+    const std::string& file() const { return file_; }
+    int line() const { return line_; }
+    const std::string& message() const { return message_; }
+
+private:
+    std::string file_;
+    int line_;
+    std::string message_;
+};
+
+// A setting the form's code makes when the form opens (`set Prop VALUE`): for what a control
+// does not store, such as a date box's range. The value is kept as written, so that a form
+// saved again writes `fy-start` and not the date it stood for on the day it was opened.
+struct OpenSetting {
+    std::string property;  // as written
+    std::string value;     // the value literal as written
+    int line = 0;
+};
+
+struct ControlSpec {
+    std::string class_name;  // the library's own spelling
+    std::string name;
+    std::string label;
+    // Field position on the form, in character cells from 1 (row 1 is the first row under
+    // the title). The label goes on the same row before the field unless placed itself.
+    int row = 1;
+    int col = 1;
+    std::optional<int> label_row, label_col;
+    // The size the form gives the control when it loads it (twips); the control may change
+    // its own size afterwards, but the file keeps what the form asks for.
+    float width = 1200;
+    float height = 300;
+    mini::StoredValues stored;
+    std::vector<OpenSetting> settings;
+    std::vector<std::string> comments;  // comment lines that stood in or before the block
+    int line = 0;                       // the `control` line
+};
+
+struct FormSpec {
+    std::string title;
+    std::vector<std::string> comments;  // comment lines before `form`
+    std::vector<ControlSpec> controls;  // tab order
+    std::vector<std::string> trailing_comments;
+};
+
+// Parses a form file. `file` names it in error messages. Class names are checked against the
+// catalogue (property pages cannot stand on a form), and so are the properties of `set`.
+FormSpec parse_form(std::string_view text, const std::string& file, const Catalogue& catalogue);
+// Reads and parses a file (FormFileError with line 0 when it cannot be read).
+FormSpec read_form_file(const std::string& path, const Catalogue& catalogue);
+
+// The text of a form file; parse_form of it gives the same form back.
+std::string write_form(const FormSpec& form);
+// Writes the file whole or not at all (through a temporary file beside it).
+void write_form_file(const std::string& path, const FormSpec& form);
+
+// Value literals as form files and scripts write them: a literal that reads back as the same
+// kind and value. `key` only chooses the hex form for colours.
+std::string value_literal(const Variant& v, std::string_view key = {});
+// A quoted string with the script language's escapes; bytes outside printable ASCII as \xHH.
+std::string string_literal(std::string_view s);
+// The value of a `set` literal: a value literal, or one of the date words `today`,
+// `fy-start`, `fy-end` (the financial year, April to March, that holds `today`).
+// ScriptError when malformed.
+Variant setting_value(std::string_view literal, Date today);
+
+// The first and last day of the financial year (1 April to 31 March) that holds `day`.
+Date financial_year_start(Date day);
+Date financial_year_end(Date day);
+
+// Loads every control of the spec onto the form (in order, so tab order is file order) with
+// the stored values, then makes the opening settings. Errors name the file and line.
+void open_form(mini::Form& form, const FormSpec& spec, const Catalogue& catalogue, const std::string& file,
+               Date today);
+
+// The spec with each control's stored values replaced by what WriteProperties stores now.
+FormSpec capture_form(mini::Form& form, const FormSpec& spec);
+
+}  // namespace kel::kelform
