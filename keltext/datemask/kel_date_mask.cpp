@@ -22,8 +22,8 @@ constexpr Colour kDefaultForeColor = 0xC00000;
 constexpr Colour kDefaultBackColor = 0xFFEFD0;
 constexpr float kDefaultWidth = 1695;
 
-constexpr int16_t kKeyUp = 38;
-constexpr int16_t kKeyDown = 40;
+constexpr int16_t kVkUpArrow = 38;
+constexpr int16_t kVkDownArrow = 40;
 constexpr int16_t kAsciiBackspace = 8;
 constexpr int16_t kAsciiEnter = 13;
 constexpr int16_t kAsciiSlash = 47;
@@ -68,10 +68,17 @@ std::optional<bool> bool_value(const Variant& v) {
 
 KelDateMask::KelDateMask(Site& site)
     : site_(site), MskDate(site.create_masked_edit("MskDate")), ImgButton(site.create_image("ImgButton")) {
-    // The constituents' design values.
+    // The constituents' design values: laid out for a box of the default width. A loaded box
+    // takes its width from the field's (see ReadProperties), so that width is the design one.
     MskDate.Mask(std::string(kDateMask));
     MskDate.Font(default_font());
+    MskDate.Left(1);
+    MskDate.Top(1);
+    MskDate.Width(kDefaultWidth - kButtonRoom);
+    MskDate.Height(kHeight);
     ImgButton.Visible(true);
+    ImgButton.Left(kDefaultWidth - kButtonFromRight);
+    ImgButton.Top(1);
 
     WidgetEvents msk;
     msk.key_down = [this](int16_t& k, int16_t& s) { MskDate_KeyDown(k, s); };
@@ -401,8 +408,8 @@ void KelDateMask::MskDate_KeyDown(int16_t& key_code, int16_t& shift) {
     raise_key_event(kKeyDown, "KeyDown", key_code, shift);
     ctrl_down_ = (shift & 2) != 0;
     if (ctrl_down_) return;
-    if (key_code == kKeyUp) site_.keyboard().send_keys("+{TAB}");
-    if (key_code == kKeyDown) site_.keyboard().send_keys("{TAB}");
+    if (key_code == kVkUpArrow) site_.keyboard().send_keys("+{TAB}");
+    if (key_code == kVkDownArrow) site_.keyboard().send_keys("{TAB}");
 }
 
 void KelDateMask::MskDate_KeyPress(int16_t& key_ascii) {

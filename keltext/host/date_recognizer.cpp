@@ -31,15 +31,6 @@ std::optional<Field> read_field(std::string_view s) {
     return f;
 }
 
-// A short year in the window the date box widens with: 00..40 -> 2000..2040, 41..99 -> 1941..1999.
-int widen_year(int year) { return year <= 40 ? 2000 + year : 1900 + year; }
-
-std::optional<int> read_year(const Field& f) {
-    if (f.digits == 4) return f.value;
-    if (f.digits == 1 || f.digits == 2) return widen_year(f.value);
-    return std::nullopt;
-}
-
 }  // namespace
 
 std::optional<Date> recognize_date_text(std::string_view text) {
@@ -65,9 +56,8 @@ std::optional<Date> recognize_date_text(std::string_view text) {
         return make_date(first->value, second->value, third->value);
     }
     if (first->digits > 2) return std::nullopt;
-    const auto year = read_year(*third);
-    if (!year) return std::nullopt;
-    return make_date(*year, second->value, first->value);
+    if (third->digits != 4) return std::nullopt;
+    return make_date(third->value, second->value, first->value);
 }
 
 std::optional<Date> recognize_date(const Variant& v) {
