@@ -31,12 +31,13 @@ bool stored_equal(const Variant& a, const Variant& b) {
 }
 
 PropertyStore::PropertyStore(const StoredValues& values) {
-    for (const auto& [key, value] : values) {
+    for (const auto& entry : values) {
+        const std::string& key = entry.first;
         auto it = std::find_if(values_.begin(), values_.end(), [&](const auto& kv) { return same_name(kv.first, key); });
         if (it != values_.end())
-            it->second = detached(value);  // a repeated key: the last one wins
+            it->second = detached(entry.second);  // a repeated key: the last one wins
         else
-            values_.emplace_back(key, detached(value));
+            values_.emplace_back(key, detached(entry.second));
     }
 }
 
