@@ -1,13 +1,16 @@
 #include "apps/kelform/form_file.h"
 
+#include <algorithm>
 #include <charconv>
 #include <cmath>
 #include <cstdio>
+#include <ctime>
 #include <fstream>
 #include <limits>
 #include <sstream>
 #include <system_error>
 
+#include "apps/kelform/script_player.h"
 #include "apps/kelform/script_syntax.h"
 #include "keltext/host/charset.h"
 #include "keltext/host/conversions.h"
@@ -23,6 +26,12 @@ FormFileError::FormFileError(std::string file, int line, const std::string& mess
       message_(message) {}
 
 namespace {
+
+const ClassInfo* find_class(std::span<const ClassInfo> classes, std::string_view name) {
+    for (const ClassInfo& c : classes)
+        if (same_name(c.name, name)) return &c;
+    return nullptr;
+}
 
 constexpr int kMaxCell = 999;            // rows and columns a form may use
 constexpr float kMaxTwips = 1000000.0f;  // far beyond any screen
@@ -50,7 +59,7 @@ std::string float_text(float v) {
 
 class Parser {
 public:
-    Parser(const std::string& file, const Catalogue& catalogue) : file_(file), catalogue_(catalogue) {}
+    Parser(const std::string& file, std::span<const ClassInfo> classes) : file_(file), classes_(classes) {}
 
     FormSpec parse(std::string_view text) {
         int line_no = 0;
@@ -137,7 +146,7 @@ private:
         if (current_) fail(line_no, "control '" + current_->name + "' (line " + std::to_string(current_->line) +
                                         ") has no 'end' before the next control");
         if (args.size() != 2) fail(line_no, "'control' takes a class and a name");
-        const ClassInfo* cls = catalogue_.find(args[0]);
+        const ClassInfo* cls = find_class(classes_, args[0]);
         if (!cls) fail(line_no, "unknown class '" + shown(args[0]) + "'");
         if (cls->is_page) fail(line_no, "'" + cls->name + "' is a property page, not a control");
         const std::string name(args[1]);
@@ -221,7 +230,7 @@ private:
     }
 
     const std::string& file_;
-    const Catalogue& catalogue_;
+    std::span<const ClassInfo> classes_;
     FormSpec spec_;
     bool have_form_ = false;
     bool seen_at_ = false;
@@ -318,17 +327,17 @@ std::string value_literal(const Variant& v, std::string_view key) {
     return "empty";
 }
 
-FormSpec parse_form(std::string_view text, const std::string& file, const Catalogue& catalogue) {
-    return Parser(file, catalogue).parse(text);
+FormSpec parse_form(std::string_view text, const std::string& file, std::span<const ClassInfo> classes) {
+    return Parser(file, classes).parse(text);
 }
 
-FormSpec read_form_file(const std::string& path, const Catalogue& catalogue) {
+FormSpec read_form_file(const std::string& path, std::span<const ClassInfo> classes) {
     std::ifstream in(path, std::ios::binary);
     if (!in) throw FormFileError(path, 0, "cannot open the file");
     std::ostringstream text;
     text << in.rdbuf();
     if (in.bad()) throw FormFileError(path, 0, "cannot read the file");
-    return parse_form(text.str(), path, catalogue);
+    return parse_form(text.str(), path, classes);
 }
 
 std::string write_form(const FormSpec& form) {
@@ -396,10 +405,10 @@ Variant setting_value(std::string_view literal, Date today) {
     return parse_value(literal);
 }
 
-void open_form(mini::Form& form, const FormSpec& spec, const Catalogue& catalogue, const std::string& file,
+void open_form(mini::Form& form, const FormSpec& spec, std::span<const ClassInfo> classes, const std::string& file,
                Date today) {
     for (const ControlSpec& c : spec.controls) {
-        const ClassInfo* cls = catalogue.find(c.class_name);
+        const ClassInfo* cls = find_class(classes, c.class_name);
         if (!cls) throw FormFileError(file, c.line, "unknown class '" + c.class_name + "'");
         try {
             // The form then places the control at its size, as a container lays out a loaded
@@ -435,9 +444,68 @@ void open_form(mini::Form& form, const FormSpec& spec, const Catalogue& catalogu
 
 FormSpec capture_form(mini::Form& form, const FormSpec& spec) {
     FormSpec out = spec;
-    for (ControlSpec& c : out.controls)
-        if (mini::HostedControl* hosted = form.find(c.name)) c.stored = form.save(*hosted);
+    int next_row = 1;
+    for (const ControlSpec& c : out.controls) next_row = std::max(next_row, c.row + 2);
+    for (mini::HostedControl* hosted : form.controls()) {
+        auto it = std::find_if(out.controls.begin(), out.controls.end(),
+                               [&](const ControlSpec& c) { return same_name(c.name, hosted->name()); });
+        if (it == out.controls.end()) {
+            ControlSpec added;
+            added.class_name = hosted->info().name;
+            added.name = hosted->name();
+            added.label = hosted->name();
+            added.row = std::min(next_row, kMaxCell);
+            added.col = 20;
+            next_row += 2;
+            mini::Part& surface = hosted->surface_part();
+            added.width = static_cast<float>(surface.peek("Width").number());
+            added.height = static_cast<float>(surface.peek("Height").number());
+            out.controls.push_back(std::move(added));
+            it = out.controls.end() - 1;
+        }
+        it->stored = form.save(*hosted);
+    }
     return out;
+}
+
+Date local_today() {
+    const std::time_t now = std::time(nullptr);
+    std::tm local{};
+    if (!localtime_r(&now, &local)) return make_date(2000, 1, 1).value_or(Date{});
+    return make_date(local.tm_year + 1900, local.tm_mon + 1, local.tm_mday).value_or(Date{});
+}
+
+void add_form_commands(Player& player, std::span<const ClassInfo> classes) {
+    // The spec the script's form was loaded from, shared by the two commands of this player.
+    auto spec = std::make_shared<FormSpec>();
+    spec->title = "Form";
+    const auto file_arg = [](Args& a) {
+        const std::string_view word = a.next("FILE");
+        a.finish();
+        return is_string_literal(word) ? decode_string(word) : std::string(word);
+    };
+    player.add_command("loadform", [spec, classes, file_arg](Player& p, Args& a) {
+        const std::string file = file_arg(a);
+        try {
+            FormSpec loaded = read_form_file(file, classes);
+            open_form(p.form(), loaded, classes, file, local_today());
+            if (spec->controls.empty()) {
+                *spec = std::move(loaded);
+            } else {
+                for (auto& c : loaded.controls) spec->controls.push_back(std::move(c));
+            }
+        } catch (const FormFileError& e) {
+            throw ScriptError(e.what());
+        }
+    });
+    player.add_command("saveform", [spec, file_arg](Player& p, Args& a) {
+        const std::string file = file_arg(a);
+        try {
+            write_form_file(file, capture_form(p.form(), *spec));
+        } catch (const FormFileError& e) {
+            throw ScriptError(e.what());
+        }
+    });
 }
 
 }  // namespace kel::kelform

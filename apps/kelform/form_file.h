@@ -5,6 +5,7 @@
 // and the settings the form's code makes when the form opens. docs/kelform.md describes the
 // format.
 #include <optional>
+#include <span>
 #include <stdexcept>
 #include <string>
 #include <string_view>
@@ -12,7 +13,7 @@
 
 #include "keltext/host/date.h"
 #include "keltext/host/variant.h"
-#include "keltext/library/catalogue.h"
+#include "keltext/host/members.h"
 #include "keltext/minihost/form.h"
 
 namespace kel::kelform {
@@ -68,10 +69,10 @@ struct FormSpec {
 };
 
 // Parses a form file. `file` names it in error messages. Class names are checked against the
-// catalogue (property pages cannot stand on a form), and so are the properties of `set`.
-FormSpec parse_form(std::string_view text, const std::string& file, const Catalogue& catalogue);
+// classes given (property pages cannot stand on a form), and so are the properties of `set`.
+FormSpec parse_form(std::string_view text, const std::string& file, std::span<const ClassInfo> classes);
 // Reads and parses a file (FormFileError with line 0 when it cannot be read).
-FormSpec read_form_file(const std::string& path, const Catalogue& catalogue);
+FormSpec read_form_file(const std::string& path, std::span<const ClassInfo> classes);
 
 // The text of a form file; parse_form of it gives the same form back.
 std::string write_form(const FormSpec& form);
@@ -94,10 +95,20 @@ Date financial_year_end(Date day);
 
 // Loads every control of the spec onto the form (in order, so tab order is file order) with
 // the stored values, then makes the opening settings. Errors name the file and line.
-void open_form(mini::Form& form, const FormSpec& spec, const Catalogue& catalogue, const std::string& file,
+void open_form(mini::Form& form, const FormSpec& spec, std::span<const ClassInfo> classes, const std::string& file,
                Date today);
 
+// Today's date on this machine's clock, in local time.
+Date local_today();
+
 // The spec with each control's stored values replaced by what WriteProperties stores now.
+// Controls on the form that the spec does not hold are added below the others, with their
+// name as the label and their present size.
 FormSpec capture_form(mini::Form& form, const FormSpec& spec);
+
+class Player;
+// Adds `loadform FILE` and `saveform FILE` to a script player. Both remember the form spec
+// between them, so that a form loaded and saved again keeps its title, labels and places.
+void add_form_commands(Player& player, std::span<const ClassInfo> classes);
 
 }  // namespace kel::kelform

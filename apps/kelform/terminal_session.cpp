@@ -1,0 +1,817 @@
+#include "apps/kelform/terminal_session.h"
+
+#include <algorithm>
+#include <cmath>
+#include <cstdio>
+
+#include "apps/kelform/script_syntax.h"
+#include "keltext/host/charset.h"
+#include "keltext/host/conversions.h"
+#include "keltext/host/date_recognizer.h"
+#include "keltext/host/errors.h"
+#include "keltext/minihost/keyboard.h"
+
+namespace kel::kelform {
+
+namespace {
+
+using mini::HostedControl;
+using mini::Keystroke;
+using mini::Part;
+
+constexpr float kTwipsPerCell = 120;  // a Fixedsys character cell, as the controls size themselves
+constexpr std::size_t kMaxEvents = 500;
+constexpr int kCalendarHeight = 10;
+constexpr int kCalendarWidth = 22;
+constexpr int kListRows = 8;
+
+constexpr const char* kMonthNames[] = {"January", "February", "March",     "April",   "May",      "June",
+                                       "July",    "August",   "September", "October", "November", "December"};
+
+int cells(double twips) { return static_cast<int>(std::lround(twips / kTwipsPerCell)); }
+
+// Reads a member of a part, or nothing when the part lacks it or refuses the read.
+std::optional<Variant> peek(const Part* part, std::string_view member) {
+    if (!part || !mini::find_member(*part, member)) return std::nullopt;
+    try {
+        return part->peek(member);
+    } catch (const RuntimeError&) {
+        return std::nullopt;
+    }
+}
+
+double peek_number(const Part* part, std::string_view member, double fallback = 0) {
+    const auto v = peek(part, member);
+    return v ? v->number() : fallback;
+}
+
+bool peek_bool(const Part* part, std::string_view member, bool fallback) {
+    const auto v = peek(part, member);
+    if (!v) return fallback;
+    if (const bool* b = v->get_if<bool>()) return *b;
+    return v->number() != 0;
+}
+
+std::optional<Colour> peek_colour(const Part* part, std::string_view member) {
+    const auto v = peek(part, member);
+    if (!v || !v->is_number()) return std::nullopt;
+    return static_cast<Colour>(static_cast<int64_t>(v->number()));
+}
+
+Part* part_of_type(HostedControl& control, std::string_view type) {
+    for (auto& [name, part] : control.parts())
+        if (part && part->widget_type() == type) return part;
+    return nullptr;
+}
+
+bool is_class(const HostedControl& c, std::string_view name) { return same_name(c.info().name, name); }
+
+// Late-bound read of a property; nothing when the control refuses it.
+std::optional<Variant> property(HostedControl& c, std::string_view name) {
+    try {
+        return c.dispatch().get(name);
+    } catch (const RuntimeError&) {
+        return std::nullopt;
+    }
+}
+
+int weekday(Date d) { return ((d.serial + 6) % 7 + 7) % 7; }  // 0 Sunday; day 0 was a Saturday
+
+Date add_months(int year, int month, int day, int delta) {
+    int m = month - 1 + delta;
+    int y = year + (m >= 0 ? m / 12 : (m - 11) / 12);
+    m = ((m % 12) + 12) % 12 + 1;
+    y = std::clamp(y, 100, 9999);
+    const int d = std::min(day, days_in_month(y, m));
+    return make_date(y, m, d).value_or(Date{});
+}
+
+std::string json_number(double v) {
+    if (!std::isfinite(v)) return "null";
+    return plain_number_text(v);
+}
+
+std::string json_value(const Variant& v) {
+    switch (v.kind()) {
+        case VarKind::Empty: return "null";
+        case VarKind::Boolean: return *v.get_if<bool>() ? "true" : "false";
+        case VarKind::String: return json_string(v.str());
+        case VarKind::Date: return json_string(date_text(*v.get_if<Date>()));
+        case VarKind::Object: return "null";
+        default: return json_number(v.number());
+    }
+}
+
+}  // namespace
+
+std::string json_string(std::string_view cp1252) {
+    std::string out = "\"";
+    for (char c : cp1252) {
+        const auto b = static_cast<unsigned char>(c);
+        switch (c) {
+            case '"': out += "\\\""; break;
+            case '\\': out += "\\\\"; break;
+            case '\n': out += "\\n"; break;
+            case '\r': out += "\\r"; break;
+            case '\t': out += "\\t"; break;
+            default:
+                if (b < 0x20 || b == 0x7F) {
+                    char buf[8];
+                    std::snprintf(buf, sizeof buf, "\\u%04x", b);
+                    out += buf;
+                } else {
+                    append_utf8(out, to_unicode(b));
+                }
+        }
+    }
+    return out + "\"";
+}
+
+TerminalSession::TerminalSession(mini::Form& form, const FormSpec& spec, Date today)
+    : form_(form), spec_(spec), today_(today) {
+    form_.set_observer(this);
+    for (HostedControl* c : form_.controls())
+        if (c->can_take_focus()) {
+            form_.focus(c);
+            break;
+        }
+}
+
+TerminalSession::~TerminalSession() { form_.set_observer(nullptr); }
+
+// ---- the form's own code -------------------------------------------------------------------
+
+std::string TerminalSession::label_of(const HostedControl& control) const {
+    for (const ControlSpec& c : spec_.controls)
+        if (same_name(c.name, control.name()) && !c.label.empty()) return c.label;
+    return control.name();
+}
+
+void TerminalSession::log(std::string line) {
+    events_.push_back(std::move(line));
+    while (events_.size() > kMaxEvents) events_.pop_front();
+}
+
+void TerminalSession::event_raised(HostedControl& control, int /*number*/, std::string_view event,
+                                   std::span<EventArg> args) {
+    std::string line = "event " + control.name() + "." + std::string(event);
+    for (const EventArg& a : args) line += " " + std::string(a.name) + "=" + format_plain(a.value);
+    log(std::move(line));
+
+    if (same_name(event, "ControlError")) {
+        const auto decimals = property(control, "NoOfDecimals");
+        const auto length = property(control, "MaxLength");
+        std::string rule = "digits and one decimal point";
+        if (decimals && length) {
+            const int d = static_cast<int>(decimals->number());
+            const int n = static_cast<int>(length->number());
+            rule = d > 0 ? "at most " + std::to_string(std::max(n - d - 1, 0)) + " digits, a point and " +
+                               std::to_string(d) + " decimals"
+                         : "at most " + std::to_string(n) + " digits";
+        }
+        say(label_of(control) + ": that key is not taken here (" + rule + ")");
+    } else if (same_name(event, "DateError")) {
+        const auto style = property(control, "DateStyle");
+        if (style && style->number() == 1)
+            say(label_of(control) + ": enter a month 01 to 12 and a two-digit year (mm/yy)");
+        else
+            say(label_of(control) + ": not a date (dd/mm/yyyy) the form can take");
+    } else if (same_name(event, "ButtonClick")) {
+        open_calendar(control);
+    }
+}
+
+void TerminalSession::keys_sent(HostedControl& control, std::string_view keys) {
+    log("sendkeys " + control.name() + " " + quote(keys));
+}
+
+void TerminalSession::handler_error(std::string_view where, int number) {
+    log(std::string(where) + " -> " + format_error(number));
+    say(std::string(where) + ": error " + std::to_string(number) + " (" + error_description(number) + ")");
+}
+
+void TerminalSession::keep_failed_date(HostedControl* left) {
+    if (!left || left == form_.focused() || !is_class(*left, "KelDateMask")) return;
+    const auto allow = property(*left, "AllowLostFocus");
+    if (!allow || allow->number() != 0) return;
+    // Entering the box again clears the flag, so a second attempt to leave is let through:
+    // the form insists once and explains, it never locks the person in.
+    form_.focus(left);
+    if (status_.empty()) say(label_of(*left) + ": the date is not right; correct it, or leave again to keep it");
+    else status_ += "; focus stays until it is corrected (or you leave again)";
+}
+
+// ---- input ---------------------------------------------------------------------------------
+
+TerminalSession::Outcome TerminalSession::handle(const Input& input) {
+    status_.clear();
+    HostedControl* before = form_.focused();
+    Outcome outcome = Outcome::going_on;
+    try {
+        switch (input.kind) {
+            case Input::Kind::key: outcome = handle_key(input.key, input.shift); break;
+            case Input::Kind::character: handle_character(input.ch); break;
+            case Input::Kind::click: handle_click(input.row, input.col); break;
+        }
+    } catch (const RuntimeError& e) {
+        // A run-time error that reached the form from one of its own calls: shown, not fatal.
+        say("error " + std::to_string(e.number()) + " (" + e.what() + ")");
+    } catch (const mini::FormError& e) {
+        say(e.what());
+    }
+    if (outcome == Outcome::going_on) keep_failed_date(before);
+    return outcome;
+}
+
+void TerminalSession::deliver(const Keystroke& k) {
+    if (!form_.focused()) return;
+    form_.keystroke(k);
+}
+
+bool TerminalSession::finish_focus() {
+    // Finishing is like pressing the form's OK button: focus leaves the field first, so the
+    // field completes and checks its value as it does when focus moves on.
+    HostedControl* left = form_.focused();
+    if (!left) return true;
+    form_.focus(nullptr);
+    const auto allow = is_class(*left, "KelDateMask") ? property(*left, "AllowLostFocus") : std::nullopt;
+    if (allow && allow->number() == 0) {
+        form_.focus(left);
+        const std::string why = status_.empty() ? label_of(*left) + ": the date is not right" : status_;
+        say(why + "; correct it, or press F10 again to finish as it is");
+        return false;
+    }
+    return true;
+}
+
+TerminalSession::Outcome TerminalSession::handle_key(int16_t key, int16_t shift) {
+    const bool ctrl = (shift & mini::kCtrlMask) != 0;
+    const bool alt = (shift & mini::kAltMask) != 0;
+    if (calendar_) {
+        if (calendar_key(key, shift)) return Outcome::going_on;
+        calendar_.reset();
+    }
+    if (list_) {
+        if (list_key(key, shift)) return Outcome::going_on;
+        list_.reset();
+    }
+    if (key == mini::kVkF1 + 9 || (ctrl && key == 'S')) {  // F10
+        return finish_focus() ? Outcome::finished : Outcome::going_on;
+    }
+    if ((key == mini::kVkEscape && shift == 0) || (ctrl && key == 'Q')) return Outcome::quit;
+    if (key == mini::kVkF1 + 1) {  // F2
+        events_shown_ = !events_shown_;
+        return Outcome::going_on;
+    }
+    HostedControl* focused = form_.focused();
+    if (key == mini::kVkTab && !ctrl && !alt) {
+        if (focused) form_.tab((shift & mini::kShiftMask) == 0);
+        else if (auto all = form_.controls(); !all.empty()) form_.tab(true);
+        return Outcome::going_on;
+    }
+    if (!focused) return Outcome::going_on;
+    const bool f4 = key == mini::kVkF1 + 3 && shift == 0;
+    if (f4 || (alt && (key == mini::kVkDown || key == mini::kVkUp))) {
+        if (is_class(*focused, "KelCombo") && (f4 || key == mini::kVkDown)) {
+            open_list(*focused);
+            return Outcome::going_on;
+        }
+        if (is_class(*focused, "KelDateMask") && (f4 || key == mini::kVkDown)) {
+            press_calendar_button(*focused);
+            return Outcome::going_on;
+        }
+        if (is_class(*focused, "KelNumeric") && alt) {
+            press_spin(*focused, key == mini::kVkUp);
+            return Outcome::going_on;
+        }
+    }
+    Keystroke k{key, shift, std::nullopt};
+    // Keys that make a character: Backspace, Enter, Escape and Ctrl with a letter.
+    if (key == mini::kVkBackspace || key == mini::kVkEnter) k.char_code = key;
+    else if (ctrl && !alt && key >= 'A' && key <= 'Z') k.char_code = static_cast<int16_t>(key - 64);
+    deliver(k);
+    return Outcome::going_on;
+}
+
+void TerminalSession::handle_character(char32_t ch) {
+    if (calendar_) {
+        if (ch == U' ') {
+            pick_calendar_day();
+            return;
+        }
+        calendar_.reset();
+    }
+    list_.reset();
+    const auto byte = from_unicode(ch);
+    if (!byte || *byte < 0x20 || *byte == 0x7F) {
+        // Outside the form's character set: refused, as a control refuses a key it cannot take.
+        std::string shown_ch;
+        append_utf8(shown_ch, ch);
+        say("'" + shown_ch + "' cannot be typed here: the form holds Windows-1252 text");
+        return;
+    }
+    deliver(mini::keystroke_for_char(*byte));
+}
+
+void TerminalSession::press_calendar_button(HostedControl& control) {
+    Part* image = part_of_type(control, "Image");
+    if (!image || !peek_bool(image, "Visible", false)) return;
+    form_.click(control, *image);
+}
+
+void TerminalSession::press_spin(HostedControl& control, bool up) {
+    Part* spin = part_of_type(control, "SpinButton");
+    if (!spin || !peek_bool(spin, "Visible", false)) return;
+    form_.notify(control, *spin, up ? "UpClick" : "DownClick");
+}
+
+// ---- the combo's list ----------------------------------------------------------------------
+
+void TerminalSession::open_list(HostedControl& control) {
+    Part* combo = part_of_type(control, "ComboBox");
+    if (!combo || !control.can_take_focus()) return;
+    form_.notify(control, *combo, "DropDown");
+    const int32_t count = static_cast<int32_t>(peek_number(combo, "ListCount"));
+    if (count <= 0) {
+        say(label_of(control) + ": the list is empty");
+        return;
+    }
+    const int32_t index = static_cast<int32_t>(peek_number(combo, "ListIndex", -1));
+    list_ = ListPopup{control.name(), std::clamp(index, 0, count - 1)};
+}
+
+void TerminalSession::pick_list_entry(int32_t index) {
+    if (!list_) return;
+    HostedControl* control = form_.find(list_->control);
+    list_.reset();
+    if (!control) return;
+    Part* combo = part_of_type(*control, "ComboBox");
+    if (!combo) return;
+    if (form_.focused() != control) form_.focus(control);
+    combo->poke("ListIndex", Variant(index));
+    // The whole entry is selected, as after a pick from a drop-down list.
+    const auto text = peek(combo, "Text");
+    form_.select(*control, 0, text ? static_cast<int32_t>(text->str().size()) : 0);
+}
+
+bool TerminalSession::list_key(int16_t key, int16_t shift) {
+    HostedControl* control = form_.find(list_->control);
+    Part* combo = control ? part_of_type(*control, "ComboBox") : nullptr;
+    const int32_t count = static_cast<int32_t>(peek_number(combo, "ListCount"));
+    if (count <= 0) return false;
+    const bool alt = (shift & mini::kAltMask) != 0;
+    int32_t& h = list_->highlight;
+    switch (key) {
+        case mini::kVkUp:
+            if (alt) break;
+            h = std::max(h - 1, 0);
+            return true;
+        case mini::kVkDown:
+            if (alt) break;
+            h = std::min(h + 1, count - 1);
+            return true;
+        case mini::kVkPageUp: h = std::max(h - kListRows, 0); return true;
+        case mini::kVkPageDown: h = std::min(h + kListRows, count - 1); return true;
+        case mini::kVkHome: h = 0; return true;
+        case mini::kVkEnd: h = count - 1; return true;
+        case mini::kVkEnter: pick_list_entry(h); return true;
+        case mini::kVkEscape: list_.reset(); return true;
+        case mini::kVkTab: pick_list_entry(h); return false;  // picks, then Tab moves on
+        default: break;
+    }
+    if (key == mini::kVkF1 + 3 || (alt && (key == mini::kVkUp || key == mini::kVkDown))) {
+        pick_list_entry(h);
+        return true;
+    }
+    return false;
+}
+
+// ---- the calendar --------------------------------------------------------------------------
+
+void TerminalSession::open_calendar(HostedControl& control) {
+    // The box's own date, else today, brought into the box's range.
+    Part* field = control.keyboard_part();
+    const auto text = peek(field, "Text");
+    std::optional<Date> day = text ? recognize_date_text(text->str()) : std::nullopt;
+    Date d = day.value_or(today_);
+    const auto lo = property(control, "MinDate");
+    const auto hi = property(control, "MaxDate");
+    if (const auto min = lo ? recognize_date(*lo) : std::nullopt; min && d < *min) d = *min;
+    if (const auto max = hi ? recognize_date(*hi) : std::nullopt; max && d > *max) d = *max;
+    const Ymd ymd = to_ymd(d);
+    list_.reset();
+    calendar_ = Calendar{control.name(), ymd.year, ymd.month, ymd.day};
+}
+
+void TerminalSession::pick_calendar_day() {
+    if (!calendar_) return;
+    HostedControl* control = form_.find(calendar_->control);
+    const auto day = make_date(calendar_->year, calendar_->month, calendar_->day);
+    if (!control || !day) {
+        calendar_.reset();
+        return;
+    }
+    const auto lo = property(*control, "MinDate");
+    const auto hi = property(*control, "MaxDate");
+    const auto min = lo ? recognize_date(*lo) : std::nullopt;
+    const auto max = hi ? recognize_date(*hi) : std::nullopt;
+    if ((min && *day < *min) || (max && *day > *max)) {
+        std::string range = min && max ? date_text(*min) + " to " + date_text(*max)
+                            : min      ? "from " + date_text(*min)
+                                       : "up to " + date_text(*max);
+        say(label_of(*control) + ": pick a day " + range);
+        return;
+    }
+    calendar_.reset();
+    if (form_.focused() != control) form_.focus(control);
+    control->dispatch().set("Text", Variant(*day));
+}
+
+bool TerminalSession::calendar_key(int16_t key, int16_t shift) {
+    Calendar& c = *calendar_;
+    const auto day = make_date(c.year, c.month, c.day).value_or(today_);
+    const auto move_to = [&](Date d) {
+        if (const Ymd y = to_ymd(d); y.year >= 100 && y.year <= 9999) c.year = y.year, c.month = y.month, c.day = y.day;
+    };
+    if (shift & (mini::kCtrlMask | mini::kAltMask)) {
+        if ((shift & mini::kAltMask) && key == mini::kVkUp) {
+            calendar_.reset();
+            return true;
+        }
+        return false;
+    }
+    switch (key) {
+        case mini::kVkLeft: move_to(Date{day.serial - 1}); return true;
+        case mini::kVkRight: move_to(Date{day.serial + 1}); return true;
+        case mini::kVkUp: move_to(Date{day.serial - 7}); return true;
+        case mini::kVkDown: move_to(Date{day.serial + 7}); return true;
+        case mini::kVkPageUp: move_to(add_months(c.year, c.month, c.day, -1)); return true;
+        case mini::kVkPageDown: move_to(add_months(c.year, c.month, c.day, 1)); return true;
+        case mini::kVkHome: c.day = 1; return true;
+        case mini::kVkEnd: c.day = days_in_month(c.year, c.month); return true;
+        case mini::kVkEnter: pick_calendar_day(); return true;
+        case mini::kVkEscape: calendar_.reset(); return true;
+        default: return false;
+    }
+}
+
+// ---- clicks --------------------------------------------------------------------------------
+
+void TerminalSession::handle_click(int row, int col) {
+    if (last_layout_.empty()) last_layout_ = layout(rows_, cols_);
+    if (calendar_) {
+        for (const Layout& l : last_layout_)
+            if (l.control->name() == calendar_->control) {
+                if (calendar_rect(l, rows_, cols_).contains(row, col)) return calendar_click(row, col);
+                break;
+            }
+        calendar_.reset();
+    }
+    if (list_) {
+        for (const Layout& l : last_layout_)
+            if (l.control->name() == list_->control) {
+                if (list_rect(l, rows_).contains(row, col)) return list_click(row, col);
+                break;
+            }
+        list_.reset();
+    }
+    for (const Layout& l : last_layout_) {
+        HostedControl& c = *l.control;
+        const bool on_field = l.field.contains(row, col);
+        if (!on_field && !l.label.contains(row, col)) continue;
+        if (!c.surface_part().peek("Enabled").number()) return;  // a disabled control takes no clicks
+        if (on_field && l.spin_col && (col == *l.spin_col || col == *l.spin_col + 1)) {
+            press_spin(c, col == *l.spin_col);
+            return;
+        }
+        if (on_field && l.image_col && col == *l.image_col) {
+            press_calendar_button(c);
+            return;
+        }
+        if (form_.focused() != &c) {
+            if (!c.can_take_focus()) return;
+            form_.focus(&c);
+            if (form_.focused() != &c) return;
+        }
+        if (on_field && l.drop_col && col == *l.drop_col) {
+            open_list(c);
+            return;
+        }
+        if (on_field && l.edit.contains(row, col)) {
+            Part* field = c.keyboard_part();
+            const auto text = peek(field, "Text");
+            const int length = text ? static_cast<int>(text->str().size()) : 0;
+            const int pos = std::clamp(col - l.edit.col + scroll_[c.name()], 0, length);
+            const float x = static_cast<float>((col - l.edit.col) * kTwipsPerCell);
+            form_.mouse(c, *field, true, 1, 0, x, 150);
+            form_.select(c, pos, 0);
+            form_.mouse(c, *field, false, 1, 0, x, 150);
+            if (form_.focused() == &c) form_.click(c, *field);
+        }
+        return;
+    }
+}
+
+void TerminalSession::list_click(int row, int col) {
+    (void)col;
+    for (const Layout& l : last_layout_) {
+        if (l.control->name() != list_->control) continue;
+        const Rect r = list_rect(l, rows_);
+        Part* combo = part_of_type(*l.control, "ComboBox");
+        const int32_t count = static_cast<int32_t>(peek_number(combo, "ListCount"));
+        const int visible = r.height - 2;
+        const int32_t first = list_->highlight < visible ? 0 : list_->highlight - visible + 1;
+        const int32_t index = first + (row - r.row - 1);
+        if (row > r.row && row < r.row + r.height - 1 && index >= 0 && index < count) pick_list_entry(index);
+        return;
+    }
+}
+
+void TerminalSession::calendar_click(int row, int col) {
+    for (const Layout& l : last_layout_) {
+        if (l.control->name() != calendar_->control) continue;
+        const Rect r = calendar_rect(l, rows_, cols_);
+        Calendar& c = *calendar_;
+        if (row == r.row + 1) {  // the title row: the arrows change the month
+            if (col <= r.col + 2) {
+                const Ymd y = to_ymd(add_months(c.year, c.month, c.day, -1));
+                c.year = y.year, c.month = y.month, c.day = y.day;
+            } else if (col >= r.col + r.width - 3) {
+                const Ymd y = to_ymd(add_months(c.year, c.month, c.day, 1));
+                c.year = y.year, c.month = y.month, c.day = y.day;
+            }
+            return;
+        }
+        const int week = row - (r.row + 3);
+        const int dow = (col - r.col - 1) / 3;
+        if (week < 0 || week > 5 || col <= r.col || dow < 0 || dow > 6) return;
+        const auto first = make_date(c.year, c.month, 1);
+        if (!first) return;
+        const int day = week * 7 + dow - weekday(*first) + 1;
+        if (day < 1 || day > days_in_month(c.year, c.month)) return;
+        c.day = day;
+        pick_calendar_day();
+        return;
+    }
+}
+
+// ---- drawing -------------------------------------------------------------------------------
+
+std::vector<TerminalSession::Layout> TerminalSession::layout(int rows, int cols) {
+    (void)rows;
+    (void)cols;
+    std::vector<Layout> out;
+    for (const ControlSpec& spec : spec_.controls) {
+        HostedControl* c = form_.find(spec.name);
+        if (!c) continue;
+        Layout l;
+        l.control = c;
+        l.spec = &spec;
+        Part& surface = c->surface_part();
+        l.field = {spec.row, spec.col - 1, 1, std::max(cells(peek_number(&surface, "Width")), 1)};
+        Part* edit = c->keyboard_part();
+        const int edit_left = edit ? cells(peek_number(edit, "Left")) : 0;
+        int edit_width = edit ? cells(peek_number(edit, "Width")) : l.field.width;
+        if (is_class(*c, "KelCombo")) {
+            // The combo box draws its own drop-down button at its right end.
+            edit_width = std::max(edit_width, 2);
+            l.drop_col = l.field.col + edit_left + edit_width - 1;
+            --edit_width;
+        }
+        l.edit = {l.field.row, l.field.col + edit_left, 1, std::max(edit_width, 1)};
+        if (Part* spin = part_of_type(*c, "SpinButton"); spin && peek_bool(spin, "Visible", false))
+            l.spin_col = l.field.col + cells(peek_number(spin, "Left"));
+        if (Part* image = part_of_type(*c, "Image"); image && peek_bool(image, "Visible", false))
+            l.image_col = l.field.col + cells(peek_number(image, "Left"));
+        const int label_len = static_cast<int>(spec.label.size());
+        if (spec.label_row && spec.label_col)
+            l.label = {*spec.label_row, *spec.label_col - 1, 1, label_len};
+        else
+            l.label = {spec.row, std::max(l.field.col - label_len - 1, 0), 1, label_len};
+        // The field may be wider than its parts: clicks count on what is drawn.
+        int right = l.edit.col + l.edit.width;
+        if (l.spin_col) right = std::max(right, *l.spin_col + 2);
+        if (l.image_col) right = std::max(right, *l.image_col + 1);
+        if (l.drop_col) right = std::max(right, *l.drop_col + 1);
+        l.field.width = std::max(right - l.field.col, 1);
+        out.push_back(l);
+    }
+    return out;
+}
+
+TerminalSession::Rect TerminalSession::calendar_rect(const Layout& box, int rows, int cols) const {
+    const auto pos = property(*box.control, "CalendarPosition");
+    const int corner = pos ? static_cast<int>(pos->number()) : 2;
+    const bool top = corner == 0 || corner == 1;
+    const bool right = corner == 1 || corner == 3;
+    Rect r{0, 0, kCalendarHeight, kCalendarWidth};
+    r.row = top ? box.field.row - kCalendarHeight : box.field.row + 1;
+    r.col = right ? box.field.col + box.field.width - kCalendarWidth : box.field.col;
+    // Kept on the screen, between the title bar and the help line.
+    r.row = std::clamp(r.row, 1, std::max(rows - 2 - kCalendarHeight, 1));
+    r.col = std::clamp(r.col, 0, std::max(cols - kCalendarWidth, 0));
+    return r;
+}
+
+TerminalSession::Rect TerminalSession::list_rect(const Layout& box, int rows) const {
+    Part* combo = part_of_type(*box.control, "ComboBox");
+    const int count = std::max(static_cast<int>(peek_number(combo, "ListCount")), 1);
+    const int height = std::min(count, kListRows) + 2;
+    Rect r{box.field.row + 1, box.field.col, height, std::max(box.field.width, 8)};
+    if (r.row + height > rows - 2 && box.field.row - height >= 1) r.row = box.field.row - height;
+    return r;
+}
+
+void TerminalSession::draw_control(Canvas& canvas, const Layout& l, bool focused) {
+    HostedControl& c = *l.control;
+    Part* field = c.keyboard_part();
+    const bool enabled = peek_bool(&c.surface_part(), "Enabled", true) && peek_bool(field, "Enabled", true);
+
+    CellStyle label_style;
+    label_style.bold = focused;
+    label_style.dim = !enabled;
+    canvas.put_text(l.label.row, l.label.col, l.spec->label, label_style);
+
+    CellStyle style;
+    style.fg = peek_colour(field, "ForeColor");
+    style.bg = peek_colour(field, "BackColor");
+    if (!enabled) {
+        style.fg = kGreyText;
+        style.dim = true;
+    }
+    style.underline = !style.bg.has_value();  // no colour: the field shows as a line
+
+    const auto text_value = peek(field, "Text");
+    const std::string text = text_value ? text_value->str() : std::string();
+    const int length = static_cast<int>(text.size());
+    const int sel_start = std::clamp(static_cast<int>(peek_number(field, "SelStart")), 0, length);
+    const int sel_length = std::clamp(static_cast<int>(peek_number(field, "SelLength")), 0, length - sel_start);
+    const int caret = sel_start + sel_length;
+
+    // Scrolled so that the caret stays in view.
+    int& offset = scroll_[c.name()];
+    const int width = l.edit.width;
+    if (length < width) offset = 0;
+    offset = std::clamp(offset, 0, std::max(length - width + 1, 0));
+    if (caret < offset) offset = caret;
+    if (caret >= offset + width) offset = caret - width + 1;
+
+    canvas.fill(l.edit.row, l.edit.col, 1, width, style);
+    for (int i = 0; i < width && offset + i < length; ++i) {
+        CellStyle s = style;
+        const int pos = offset + i;
+        if (focused && sel_length > 0 && pos >= sel_start && pos < sel_start + sel_length) s.reverse = true;
+        canvas.put(l.edit.row, l.edit.col + i, to_unicode(static_cast<uint8_t>(text[static_cast<std::size_t>(pos)])), s);
+    }
+    if (focused && !calendar_ && !list_) canvas.set_cursor(l.edit.row, l.edit.col + caret - offset);
+
+    CellStyle button;
+    button.reverse = true;
+    button.dim = !enabled;
+    if (l.spin_col) {
+        canvas.put(l.edit.row, *l.spin_col, U'▲', button);
+        canvas.put(l.edit.row, *l.spin_col + 1, U'▼', button);
+    }
+    if (l.image_col) canvas.put(l.edit.row, *l.image_col, U'▦', button);
+    if (l.drop_col) canvas.put(l.edit.row, *l.drop_col, U'▼', button);
+}
+
+void TerminalSession::draw_list(Canvas& canvas, const Rect& r) {
+    HostedControl* control = form_.find(list_->control);
+    Part* combo = control ? part_of_type(*control, "ComboBox") : nullptr;
+    CellStyle frame;
+    frame.fg = peek_colour(combo, "ForeColor");
+    frame.bg = peek_colour(combo, "BackColor");
+    canvas.box(r.row, r.col, r.height, r.width, frame);
+    const int count = static_cast<int>(peek_number(combo, "ListCount"));
+    const int visible = r.height - 2;
+    const int first = list_->highlight < visible ? 0 : list_->highlight - visible + 1;
+    for (int i = 0; i < visible && first + i < count; ++i) {
+        std::string entry;
+        try {
+            entry = combo->peek("List", first + i).str();
+        } catch (const RuntimeError&) {
+            continue;
+        }
+        CellStyle s = frame;
+        s.reverse = first + i == list_->highlight;
+        canvas.fill(r.row + 1 + i, r.col + 1, 1, r.width - 2, s);
+        canvas.put_text(r.row + 1 + i, r.col + 1, entry, s, r.width - 2);
+    }
+}
+
+void TerminalSession::draw_calendar(Canvas& canvas, const Rect& r) {
+    const Calendar& c = *calendar_;
+    HostedControl* control = form_.find(c.control);
+    const auto lo = control ? property(*control, "MinDate") : std::nullopt;
+    const auto hi = control ? property(*control, "MaxDate") : std::nullopt;
+    const auto min = lo ? recognize_date(*lo) : std::nullopt;
+    const auto max = hi ? recognize_date(*hi) : std::nullopt;
+
+    CellStyle frame;
+    frame.fg = rgb(0, 0, 128);
+    frame.bg = rgb(255, 255, 255);
+    canvas.box(r.row, r.col, r.height, r.width, frame);
+    const std::string title = std::string(kMonthNames[c.month - 1]) + " " + std::to_string(c.year);
+    CellStyle bold = frame;
+    bold.bold = true;
+    canvas.put_utf8(r.row + 1, r.col + 1, "◂", bold);
+    canvas.put_utf8(r.row + 1, r.col + r.width - 2, "▸", bold);
+    canvas.put_text(r.row + 1, r.col + 1 + (r.width - 2 - static_cast<int>(title.size())) / 2, title, bold);
+    canvas.put_text(r.row + 2, r.col + 1, "Su Mo Tu We Th Fr Sa", frame);
+    const auto first = make_date(c.year, c.month, 1);
+    if (!first) return;
+    const int lead = weekday(*first);
+    const int days = days_in_month(c.year, c.month);
+    for (int day = 1; day <= days; ++day) {
+        const int slot = lead + day - 1;
+        const int row = r.row + 3 + slot / 7;
+        const int col = r.col + 1 + (slot % 7) * 3;
+        const Date d{first->serial + day - 1};
+        CellStyle s = frame;
+        if ((min && d < *min) || (max && d > *max)) {
+            s.dim = true;
+            s.fg = kGreyText;
+        }
+        if (d == today_) s.underline = true;
+        if (day == c.day) s.reverse = true;
+        const std::string number = (day < 10 ? " " : "") + std::to_string(day);
+        canvas.put_text(row, col, number, s);
+        if (day == c.day) canvas.set_cursor(row, col + 1);
+    }
+}
+
+void TerminalSession::render(Canvas& canvas) {
+    rows_ = canvas.rows();
+    cols_ = canvas.cols();
+    last_layout_ = layout(rows_, cols_);
+    HostedControl* focused = form_.focused();
+
+    CellStyle bar;
+    bar.reverse = true;
+    canvas.fill(0, 0, 1, cols_, bar);
+    canvas.put_text(0, 1, spec_.title, bar, std::max(cols_ - 12, 0));
+    canvas.put_text(0, std::max(cols_ - 8, 0), "kelform", bar);
+
+    for (const Layout& l : last_layout_) draw_control(canvas, l, l.control == focused);
+
+    if (events_shown_) {
+        const int height = std::max((rows_ - 3) / 3, 4);
+        const int top = std::max(rows_ - 2 - height, 1);
+        CellStyle pane;
+        canvas.fill(top, 0, rows_ - 2 - top, cols_, pane);
+        CellStyle rule;
+        rule.dim = true;
+        canvas.fill(top, 0, 1, cols_, rule, U'─');
+        canvas.put_text(top, 2, " Events (F2 hides) ", rule);
+        const int lines = rows_ - 2 - top - 1;
+        const int n = static_cast<int>(events_.size());
+        for (int i = 0; i < lines && i < n; ++i)
+            canvas.put_text(top + 1 + i, 1, events_[static_cast<std::size_t>(std::max(n - lines, 0) + i)], pane,
+                            cols_ - 2);
+    }
+
+    if (calendar_) {
+        for (const Layout& l : last_layout_)
+            if (l.control->name() == calendar_->control) draw_calendar(canvas, calendar_rect(l, rows_, cols_));
+    }
+    if (list_) {
+        for (const Layout& l : last_layout_)
+            if (l.control->name() == list_->control) draw_list(canvas, list_rect(l, rows_));
+    }
+
+    CellStyle help;
+    help.dim = true;
+    const char* keys = calendar_ ? " Arrows move  PgUp/PgDn month  Enter picks  Esc closes"
+                       : list_   ? " Up/Down move  Enter picks  Esc closes"
+                                 : " Tab next  F4 list/calendar  Ins overwrite  F2 events  F10 finish  Esc quit";
+    canvas.fill(rows_ - 2, 0, 1, cols_, help);
+    canvas.put_text(rows_ - 2, 0, keys, help, cols_);
+
+    CellStyle status;
+    status.reverse = true;
+    canvas.fill(rows_ - 1, 0, 1, cols_, status);
+    const std::string mode = form_.insert_on() ? " OVR " : " INS ";
+    canvas.put_text(rows_ - 1, 1, status_, status, std::max(cols_ - 7, 0));
+    canvas.put_text(rows_ - 1, std::max(cols_ - 5, 0), mode, status);
+}
+
+std::string TerminalSession::values_json() {
+    std::string out = "{";
+    bool first = true;
+    for (HostedControl* c : form_.controls()) {
+        Variant value;
+        try {
+            value = c->dispatch().get("Text");
+        } catch (const RuntimeError&) {
+            value = Variant();
+        }
+        out += first ? "\n  " : ",\n  ";
+        first = false;
+        out += json_string(c->name()) + ": " + json_value(value);
+    }
+    out += first ? "}" : "\n}";
+    return out;
+}
+
+}  // namespace kel::kelform

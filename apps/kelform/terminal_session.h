@@ -1,0 +1,139 @@
+#pragma once
+// The terminal form without the terminal: takes a person's input (keys, typed characters,
+// clicks on screen cells), drives the form's controls through the minimal host, runs the
+// form's own code (status messages, the date box's focus rule, the calendar, the combo's
+// list) and draws the whole screen into a Canvas. The curses side (tui.h) only turns terminal
+// input into Input and copies the canvas to the screen.
+#include <cstdint>
+#include <deque>
+#include <map>
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "apps/kelform/form_file.h"
+#include "apps/kelform/terminal_canvas.h"
+#include "keltext/host/date.h"
+#include "keltext/minihost/form.h"
+
+namespace kel::kelform {
+
+// One piece of input from the person.
+struct Input {
+    enum class Kind { key, character, click };
+    Kind kind = Kind::key;
+    int16_t key = 0;    // key: virtual key code (kVk...)
+    int16_t shift = 0;  // key: shift mask (1 Shift, 2 Ctrl, 4 Alt)
+    char32_t ch = 0;    // character: the Unicode character typed
+    int row = 0;        // click: the screen cell
+    int col = 0;
+
+    static Input key_of(int16_t key, int16_t shift = 0) { return {Kind::key, key, shift, 0, 0, 0}; }
+    static Input char_of(char32_t ch) { return {Kind::character, 0, 0, ch, 0, 0}; }
+    static Input click_at(int row, int col) { return {Kind::click, 0, 0, 0, row, col}; }
+};
+
+class TerminalSession : private mini::FormObserver {
+public:
+    enum class Outcome { going_on, finished, quit };
+
+    // The form must already hold the spec's controls (open_form); the session becomes its
+    // observer and puts focus in the first control that can take it.
+    TerminalSession(mini::Form& form, const FormSpec& spec, Date today);
+    ~TerminalSession() override;
+    TerminalSession(const TerminalSession&) = delete;
+    TerminalSession& operator=(const TerminalSession&) = delete;
+
+    Outcome handle(const Input& input);
+    // Draws the whole screen; the canvas size is the terminal's.
+    void render(Canvas& canvas);
+
+    // The values as the form reads them through Text, one member per control, as JSON.
+    std::string values_json();
+
+    // For tests and the screen: the status line's message, the events pane's lines.
+    const std::string& status() const { return status_; }
+    const std::deque<std::string>& events() const { return events_; }
+    bool events_shown() const { return events_shown_; }
+    bool calendar_open() const { return calendar_.has_value(); }
+    bool list_open() const { return list_.has_value(); }
+
+private:
+    struct Calendar {
+        std::string control;
+        int year = 0, month = 0, day = 0;  // the highlighted day
+    };
+    struct ListPopup {
+        std::string control;
+        int32_t highlight = 0;
+    };
+    struct Rect {
+        int row = 0, col = 0, height = 0, width = 0;
+        bool contains(int r, int c) const { return r >= row && r < row + height && c >= col && c < col + width; }
+    };
+    // Where one control stands on the screen, worked out from its surface and parts.
+    struct Layout {
+        mini::HostedControl* control = nullptr;
+        const ControlSpec* spec = nullptr;
+        Rect field;                    // the whole control
+        Rect edit;                     // its edit field
+        std::optional<int> spin_col;   // spin buttons (two cells: up, down)
+        std::optional<int> image_col;  // calendar button
+        std::optional<int> drop_col;   // combo drop-down button
+        Rect label;
+    };
+
+    // FormObserver: the form's own code.
+    void event_raised(mini::HostedControl& control, int number, std::string_view event,
+                      std::span<EventArg> args) override;
+    void keys_sent(mini::HostedControl& control, std::string_view keys) override;
+    void handler_error(std::string_view where, int number) override;
+
+    Outcome handle_key(int16_t key, int16_t shift);
+    void handle_character(char32_t ch);
+    void handle_click(int row, int col);
+    bool calendar_key(int16_t key, int16_t shift);
+    bool list_key(int16_t key, int16_t shift);
+    void calendar_click(int row, int col);
+    void list_click(int row, int col);
+
+    void deliver(const mini::Keystroke& k);
+    void open_list(mini::HostedControl& control);
+    void pick_list_entry(int32_t index);
+    void open_calendar(mini::HostedControl& control);
+    void pick_calendar_day();
+    void press_calendar_button(mini::HostedControl& control);
+    void press_spin(mini::HostedControl& control, bool up);
+    // The date box's rule: a box whose check failed (AllowLostFocus false) gets focus back.
+    void keep_failed_date(mini::HostedControl* left);
+    bool finish_focus();
+
+    std::vector<Layout> layout(int rows, int cols);
+    Rect calendar_rect(const Layout& box, int rows, int cols) const;
+    Rect list_rect(const Layout& box, int rows) const;
+    void draw_control(Canvas& canvas, const Layout& l, bool focused);
+    void draw_calendar(Canvas& canvas, const Rect& r);
+    void draw_list(Canvas& canvas, const Rect& r);
+
+    std::string label_of(const mini::HostedControl& control) const;
+    void log(std::string line);
+    void say(std::string message) { status_ = std::move(message); }
+
+    mini::Form& form_;
+    const FormSpec& spec_;
+    Date today_;
+    std::string status_;
+    std::deque<std::string> events_;
+    bool events_shown_ = false;
+    std::optional<Calendar> calendar_;
+    std::optional<ListPopup> list_;
+    std::map<std::string, int> scroll_;  // first text position shown, per control
+    int rows_ = 24, cols_ = 80;          // the size last drawn, for clicks
+    std::vector<Layout> last_layout_;
+    bool finishing_ = false;
+};
+
+// A JSON string literal of a text in the host's single-byte set.
+std::string json_string(std::string_view cp1252);
+
+}  // namespace kel::kelform
