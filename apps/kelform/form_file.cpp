@@ -268,8 +268,13 @@ std::string string_literal(std::string_view s) {
 
 namespace {
 
+// The shortest text that reads back as the same double; plain digits where that stays short
+// (5000000, not 5e+06), so that a person reads the file easily.
 std::string shortest_text(double v) {
-    char buf[64];
+    char buf[400];
+    if (const auto r = std::to_chars(buf, buf + sizeof buf, v, std::chars_format::fixed);
+        r.ec == std::errc() && r.ptr - buf <= 20)
+        return std::string(buf, r.ptr);
     const auto r = std::to_chars(buf, buf + sizeof buf, v);
     return std::string(buf, r.ptr);
 }

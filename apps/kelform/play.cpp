@@ -6,6 +6,7 @@
 #include <optional>
 #include <string>
 
+#include "apps/kelform/form_file.h"
 #include "apps/kelform/version.h"
 #include "keltext/library/catalogue.h"
 
@@ -64,7 +65,8 @@ int play_command(std::span<const std::string_view> args, std::istream& in, std::
         return 2;
     }
     Catalogue catalogue;
-    return play(args, catalogue.classes(), in, out, err);
+    return play(args, catalogue.classes(), in, out, err,
+                [&catalogue](Player& p) { add_form_commands(p, catalogue.classes()); });
 }
 
 void print_usage(std::ostream& out) {
