@@ -379,8 +379,11 @@ void Player::cmd_new(Args& a, bool load) {
     if (!cls.create) throw ScriptError("class '" + cls.name + "' cannot be created");
     if (form_->find(name)) throw ScriptError("a control named '" + name + "' already exists");
     float width = 1200, height = 300;
+    // load's optional size stands before its Key=value words: a word that starts like a number.
     auto next = a.peek();
-    if (next && !(load && next->find('=') != std::string_view::npos)) {
+    bool sized = next && (!load || (!next->empty() && std::string_view("0123456789.+-").find((*next)[0]) !=
+                                                           std::string_view::npos));
+    if (sized) {
         width = float_arg(a, "width");
         height = float_arg(a, "height");
     }
