@@ -107,9 +107,9 @@ void KelNumeric::Borderstyle(KelNBorderStyle v) {
 }
 
 Variant KelNumeric::Text() const {
-    std::string text = txtNumeric.Text();
-    if (mTxtFormat) text = StripGrouping(text);
-    return Variant(leading_value(text));
+    // Separators are removed whatever TxtFormat says now: the text may still show the grouping
+    // of an earlier exit, and a "," in this box is never anything but a separator.
+    return Variant(leading_value(StripGrouping(txtNumeric.Text())));
 }
 
 void KelNumeric::Text(const Variant& v) {

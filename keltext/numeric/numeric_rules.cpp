@@ -368,7 +368,10 @@ NumericDecision format_on_exit(const NumericEdit& e) {
     NumericDecision d;
     Work w(e, d);
     if (numeric_text(w.text())) {
-        w.set_text(plain_number_text(leading_value(w.text())));
+        // Read without separators: a text still grouped (TxtFormat turned off while the box
+        // showed 12,34,567.50, or a pasted 1,234) is its whole number, not the part before
+        // the first comma.
+        w.set_text(plain_number_text(leading_value(StripGrouping(w.text()))));
         if (e.txt_format) {
             w.set_text(FormatGrouped(w.text()));
             w.set_max_length(w.len());  // the separators must fit

@@ -226,6 +226,9 @@ TEST_F(NumericTest, TextReadsThroughTheGrouping) {
     set(n, "TxtFormat", Variant(true));
     poke(n, "txtNumeric", "Text", Variant("12,34,567.50"));
     EXPECT_EQ(get(n, "Text"), Variant(1234567.5));
+    // Turned off while the grouped text shows: the number is still read whole.
+    set(n, "TxtFormat", Variant(false));
+    EXPECT_EQ(get(n, "Text"), Variant(1234567.5));
 }
 
 // ---- typing --------------------------------------------------------------------------------------

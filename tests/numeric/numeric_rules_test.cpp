@@ -364,6 +364,8 @@ TEST(FormatOnExit, NormalizesGroupsClampsPads) {
         {"99", 0, false, 0, 0, "99", 7},
         {"-1234567", 2, true, 0, -1e9, "-12,34,567.00", 10},
         {"1234567", 0, true, 0, 0, "12,34,567", 9},
+        {"12,34,567.50", 2, false, 0, 0, "1234567.50", 7},  // still grouped from an earlier exit
+        {"1,234", 0, false, 0, 0, "1234", 7},
     };
     for (const auto& c : cases) {
         Box b{c.text, 0, 0, 7, {}, 0};
