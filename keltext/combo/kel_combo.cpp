@@ -205,10 +205,8 @@ void KelCombo::d_ComboSearch(int16_t& PKeyCode) {
     const bool sorted = cboCustom.Sorted();
     if (search_ignores_key(PKeyCode)) return;
     const std::string typed = cboCustom.Text();
-    const int32_t found = find_completion(typed, cboCustom.ListCount(), sorted, [this](int32_t i) {
-        search_buffer_ = cboCustom.List(i);
-        return std::string_view(search_buffer_);
-    });
+    const int32_t found = find_completion(typed, cboCustom.ListCount(), sorted,
+                                          [this](int32_t i) { return cboCustom.list_text(i, search_buffer_); });
     if (found < 0) return;
     const std::string completed = cboCustom.List(found);
     const auto n = static_cast<int32_t>(typed.size());

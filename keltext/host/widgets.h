@@ -7,6 +7,7 @@
 #include <memory>
 #include <optional>
 #include <string>
+#include <string_view>
 
 #include "keltext/host/font.h"
 
@@ -94,6 +95,13 @@ public:
     virtual void ListIndex(int32_t index) = 0;  // -1 selects nothing; raises click
     virtual int32_t ListCount() const = 0;
     virtual int32_t NewIndex() const = 0;
+    // The text of entry `index` as a view, valid until the list or `scratch` changes: lets a
+    // search read the whole list without a copy per entry. A list that keeps its texts
+    // returns a view of its own; this default copies into `scratch`. Index errors are 381.
+    virtual std::string_view list_text(int32_t index, std::string& scratch) const {
+        scratch = List(index);
+        return scratch;
+    }
 };
 
 // Drop-down combo box. Notifications: change, click, dbl_click, drop_down, got_focus,
