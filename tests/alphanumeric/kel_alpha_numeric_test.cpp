@@ -160,64 +160,6 @@ TEST_F(AlphaTest, TitleCaseRaisesChangeOncePerCharacterInsideTheKeyPress) {
     EXPECT_EQ(caret(a), 1);
 }
 
-TEST_F(AlphaTest, TitleCaseAfterTextSetByCode) {
-    HostedControl& a = add();
-    set(a, "Text", Variant("john"));
-    form.focus(&a);
-    form.select(a, 4, 0);
-    type(" s");
-    EXPECT_EQ(text(a), "John S");
-    EXPECT_EQ(caret(a), 6);
-}
-
-TEST_F(AlphaTest, TitleCaseInsertsSpaceInsideWord) {
-    HostedControl& a = add();
-    set(a, "Text", Variant("Johnsmith"));
-    form.focus(&a);
-    form.select(a, 4, 0);
-    type(" ");
-    EXPECT_EQ(text(a), "John Smith");
-    EXPECT_EQ(caret(a), 5);
-}
-
-TEST_F(AlphaTest, TitleCaseFullBoxStepsOverTheFollowingCharacter) {
-    HostedControl& a = add();
-    set(a, "MaxLength", Variant(int16_t{5}));
-    set(a, "Text", Variant("Abcde"));
-    form.focus(&a);
-    form.select(a, 2, 0);
-    type("x");
-    EXPECT_EQ(text(a), "Abcde");
-    type("c");  // the character after the caret: the caret steps over it
-    EXPECT_EQ(text(a), "Abcde");
-    EXPECT_EQ(caret(a), 3);
-}
-
-TEST_F(AlphaTest, TitleCaseOverwrite) {
-    HostedControl& a = add();
-    set(a, "Text", Variant("Abc"));
-    form.focus(&a);
-    form.set_insert(true);
-    form.select(a, 1, 0);
-    type("x");
-    EXPECT_EQ(text(a), "Axc");
-    EXPECT_EQ(caret(a), 2);
-    set(a, "MaxLength", Variant(int16_t{3}));
-    form.select(a, 3, 0);
-    type("d");
-    EXPECT_EQ(text(a), "Axcd");
-}
-
-TEST_F(AlphaTest, TitleCaseSelectionReplacedBySpace) {
-    HostedControl& a = add();
-    set(a, "Text", Variant("Abcd"));
-    form.focus(&a);
-    form.select(a, 1, 2);
-    type(" ");
-    EXPECT_EQ(text(a), "A D");
-    EXPECT_EQ(caret(a), 2);
-}
-
 TEST_F(AlphaTest, OverwriteModeReplacesTheCharacterAfterTheCaret) {
     struct Case {
         int32_t type;
@@ -242,17 +184,6 @@ TEST_F(AlphaTest, OverwriteModeReplacesTheCharacterAfterTheCaret) {
         type(c.typed);
         EXPECT_EQ(text(a), c.expected) << c.start << " typing " << c.typed;
     }
-}
-
-TEST_F(AlphaTest, MaxLengthLimitsTypingButNotCode) {
-    HostedControl& a = add();
-    set(a, "TextType", Variant(int32_t{KelANUpperCase}));
-    set(a, "MaxLength", Variant(int16_t{3}));
-    form.focus(&a);
-    type("abcd");
-    EXPECT_EQ(text(a), "ABC");
-    set(a, "Text", Variant("longer text"));
-    EXPECT_EQ(text(a), "longer text");
 }
 
 // ---- the form's KeyPress and the dispatch ---------------------------------------------------------
