@@ -1,6 +1,7 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
+#include <random>
 #include <string>
 #include <vector>
 
@@ -334,6 +335,32 @@ TEST(NumericKeys, TypingAsAPerson) {
             press(b, c.settings, static_cast<int16_t>(ch));
         }
         EXPECT_EQ(b.text, c.text) << c.typed;
+    }
+}
+
+TEST(NumericKeys, RandomTypingKeepsOneNumber) {
+    // Whatever a person types, clicks and selects, the box holds digits and at most one point.
+    std::mt19937 rng(20240605);
+    const std::string keys = "0123456789.0123456789.\ba/\r";
+    for (int decimals : {0, 1, 2, 4}) {
+        Settings s = with(kDec2, [&](Settings& t) {
+            t.decimals = decimals;
+            t.limit = decimals + 5;
+        });
+        Box b{"", 0, 0, s.limit, {}, 0};
+        for (int i = 0; i < 4000; ++i) {
+            int len = static_cast<int>(b.text.size());
+            if (rng() % 5 == 0) {
+                b.caret = static_cast<int>(rng() % static_cast<unsigned>(len + 1));
+                b.sel = static_cast<int>(rng() % static_cast<unsigned>(len - b.caret + 1));
+            }
+            s.overwrite = rng() % 4 == 0;
+            key_down(b, s, 0);
+            press(b, s, static_cast<int16_t>(keys[rng() % keys.size()]));
+            ASSERT_EQ(b.text.find_first_not_of("0123456789."), std::string::npos) << b.text;
+            ASSERT_LE(std::count(b.text.begin(), b.text.end(), '.'), decimals == 0 ? 0 : 1) << b.text;
+            ASSERT_LE(b.caret, static_cast<int>(b.text.size()));
+        }
     }
 }
 
