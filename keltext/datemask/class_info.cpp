@@ -26,7 +26,7 @@ ClassInfo kel_date_mask_class() {
         .property("ForeColor", "OLE_COLOR", [](C& c) { return Variant(c.ForeColor()); },
                   [](C& c, const Variant& v) { c.ForeColor(to_int32(v)); },
                   "Returns/Sets  the Foreground color used to ")
-        .property("Font", "Font", [](C& c) { return Variant(c.Font()); },
+        .property("Font", "Font", [](C& c) { return c.Font() ? Variant(c.Font()) : Variant(); },
                   [](C& c, const Variant& v) { c.Font(font_of(v)); }, "Returns a Font  Object")
         .property("Locked", "Boolean", [](C& c) { return Variant(c.Locked()); },
                   [](C& c, const Variant& v) { c.Locked(to_bool(v)); }, "")

@@ -2,6 +2,10 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
+#include <functional>
+#include <string>
+
 #include "keltext/host/date.h"
 
 namespace kel {
@@ -169,6 +173,47 @@ TEST(ClampToDateRange, Table) {
         {"not a date", y2000, none, "not a date"},
     };
     for (const auto& c : cases) EXPECT_EQ(ClampToDateRange(c.text, c.min, c.max), c.expected) << c.text;
+}
+
+}  // namespace
+}  // namespace kel
+
+namespace kel {
+namespace {
+
+// Every short text over the characters that matter: no rule misbehaves, and the completed
+// fields are always two digits in their range.
+TEST(DateRules, AnyShortTextIsHandled) {
+    const std::string alphabet = "039/- _x";
+    std::string text;
+    auto check = [](const std::string& t) {
+        for (const std::string& part : {FormatDayPart(t), FormatMonthPart(t)}) {
+            if (part.empty()) continue;
+            ASSERT_EQ(part.size(), 2u) << t;
+            ASSERT_TRUE(part >= "01" && part <= "31") << t;
+        }
+        EXPECT_EQ(FormatMonthPart(t).empty() || FormatMonthPart(t) <= "12", true) << t;
+        const std::string normal = NormalizeDateText(t, false, false);
+        // With both separators the month is at least 1, so the day is capped.
+        const auto separators = std::count(t.begin(), t.end(), '/') + std::count(t.begin(), t.end(), '-');
+        if (t.find('/') != std::string::npos && separators >= 2) {
+            const std::string day = normal.substr(0, 2);
+            ASSERT_TRUE(day >= "01" && day <= "31") << '"' << t << "\" -> \"" << normal << '"';
+        }
+        (void)NormalizeDateText(t, true, true);
+        (void)CheckMonthYear(t);
+        EXPECT_EQ(PromptToBlank(t, ddMMyyyy).size(), t.size());
+    };
+    std::function<void(std::size_t)> grow = [&](std::size_t left) {
+        check(text);
+        if (left == 0) return;
+        for (char c : alphabet) {
+            text.push_back(c);
+            grow(left - 1);
+            text.pop_back();
+        }
+    };
+    grow(5);
 }
 
 }  // namespace
