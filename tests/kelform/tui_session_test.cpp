@@ -1,0 +1,269 @@
+// The terminal form without a terminal: the demo voucher driven as a person would, checked on
+// the drawn screen, the form's code (status line, focus rule, calendar, list) and the values.
+#include <gtest/gtest.h>
+
+#include <memory>
+
+#include "apps/kelform/demo_form.h"
+#include "apps/kelform/form_file.h"
+#include "apps/kelform/terminal_session.h"
+#include "keltext/library/catalogue.h"
+#include "keltext/minihost/keyboard.h"
+
+namespace kel::kelform {
+namespace {
+
+using mini::kAltMask;
+using mini::kShiftMask;
+constexpr int16_t kF2 = mini::kVkF1 + 1, kF4 = mini::kVkF1 + 3, kF10 = mini::kVkF1 + 9;
+
+// Rows of the demo form's fields.
+constexpr int kPayeeRow = 2, kAmountRow = 6, kDateRow = 8, kPayModeRow = 10, kPeriodRow = 14;
+
+class SessionTest : public ::testing::Test {
+protected:
+    void SetUp() override {
+        spec = parse_form(demo_form_text(), "voucher.kform", catalogue.classes());
+        open_form(form, spec, catalogue.classes(), "voucher.kform", today);
+        session = std::make_unique<TerminalSession>(form, spec, today);
+    }
+
+    TerminalSession::Outcome key(int16_t k, int16_t shift = 0) { return session->handle(Input::key_of(k, shift)); }
+    void type(std::u32string_view text) {
+        for (char32_t c : text) session->handle(Input::char_of(c));
+    }
+    void tab(int times = 1) {
+        for (int i = 0; i < times; ++i) key(mini::kVkTab);
+    }
+    Canvas screen(int rows = 24, int cols = 80) {
+        Canvas c(rows, cols);
+        session->render(c);
+        return c;
+    }
+    std::string row(int r) { return screen().row_text(r); }
+    Variant text(const char* name) { return form.find(name)->dispatch().get("Text"); }
+    std::string focused() { return form.focused() ? form.focused()->name() : std::string(); }
+    bool logged(std::string_view line) {
+        for (const auto& e : session->events())
+            if (e == line) return true;
+        return false;
+    }
+    // Clicks the first cell on the row that shows `ch`.
+    void click_on(int r, char32_t ch) {
+        Canvas c = screen();
+        for (int col = 0; col < c.cols(); ++col)
+            if (c.at(r, col).ch == ch) {
+                session->handle(Input::click_at(r, col));
+                return;
+            }
+        ADD_FAILURE() << "nothing drawn on row " << r;
+    }
+
+    const Date today = make_date(2026, 12, 6).value();
+    Catalogue catalogue;
+    FormSpec spec;
+    mini::Form form;
+    std::unique_ptr<TerminalSession> session;
+};
+
+TEST_F(SessionTest, APersonFillsInTheVoucherAndFinishes) {
+    EXPECT_EQ(focused(), "Payee");
+    EXPECT_NE(row(kDateRow).find("06/12/2026"), std::string::npos) << "the form starts the date at today";
+    type(U"ramesh kumar");
+    tab();
+    type(U"abcde1234f");
+    tab();
+    type(U"1234567.5");
+    tab();
+    EXPECT_NE(row(kAmountRow).find("12,34,567.50"), std::string::npos) << row(kAmountRow);
+    type(U"31042026");
+    tab();
+    EXPECT_NE(row(kDateRow).find("30/04/2026"), std::string::npos) << row(kDateRow);
+    type(U"ch");
+    EXPECT_NE(row(kPayModeRow).find("Cheque"), std::string::npos) << row(kPayModeRow);
+    tab();
+    type(U"123456");
+    tab();
+    type(U"0526");
+    EXPECT_EQ(key(kF10), TerminalSession::Outcome::finished);
+    EXPECT_EQ(session->values_json(),
+              "{\n"
+              "  \"Payee\": \"Ramesh Kumar\",\n"
+              "  \"PAN\": \"ABCDE1234F\",\n"
+              "  \"Amount\": 1234567.5,\n"
+              "  \"VoucherDate\": \"30/04/2026\",\n"
+              "  \"PayMode\": \"Cheque\",\n"
+              "  \"ChequeNo\": \"123456\",\n"
+              "  \"Period\": \"05/26 \"\n"
+              "}");
+}
+
+TEST_F(SessionTest, TheVoucherDateStaysInTheFinancialYear) {
+    tab(3);
+    ASSERT_EQ(focused(), "VoucherDate");
+    type(U"01012020");
+    tab();
+    EXPECT_EQ(text("VoucherDate"), Variant("01/04/2026"));
+    key(mini::kVkTab, kShiftMask);
+    type(U"15062027");
+    tab();
+    EXPECT_EQ(text("VoucherDate"), Variant("31/03/2027"));
+}
+
+TEST_F(SessionTest, TheComboListOpensWithF4OrAltDown) {
+    tab(4);
+    ASSERT_EQ(focused(), "PayMode");
+    key(kF4);
+    ASSERT_TRUE(session->list_open());
+    EXPECT_TRUE(logged("event PayMode.DropDown"));
+    Canvas c = screen();
+    std::string shown;
+    for (int r = kPayModeRow + 1; r < kPayModeRow + 7; ++r) shown += c.row_text(r) + "\n";
+    for (const char* entry : {"Cash", "Cheque", "Card", "UPI"}) EXPECT_NE(shown.find(entry), std::string::npos) << shown;
+    key(mini::kVkDown);
+    key(mini::kVkDown);
+    key(mini::kVkEnter);
+    EXPECT_FALSE(session->list_open());
+    EXPECT_EQ(text("PayMode"), Variant("Card"));
+    EXPECT_EQ(form.find("PayMode")->dispatch().get("ListIndex"), Variant(int16_t{2}));
+
+    key(mini::kVkDown, kAltMask);
+    ASSERT_TRUE(session->list_open());
+    key(mini::kVkUp);
+    key(mini::kVkEscape);  // closes the list only
+    EXPECT_FALSE(session->list_open());
+    EXPECT_EQ(text("PayMode"), Variant("Card"));
+    EXPECT_EQ(focused(), "PayMode");
+}
+
+TEST_F(SessionTest, TheCalendarButtonOpensAMonthAndPicksADay) {
+    click_on(kDateRow, U'▦');
+    ASSERT_TRUE(session->calendar_open());
+    EXPECT_TRUE(logged("event VoucherDate.ButtonClick"));
+    // CalendarPosition 2, bottom left: the month hangs under the box.
+    Canvas c = screen();
+    EXPECT_NE(c.row_text(kDateRow + 2).find("December 2026"), std::string::npos) << c.row_text(kDateRow + 2);
+    key(mini::kVkRight);
+    key(mini::kVkEnter);
+    EXPECT_FALSE(session->calendar_open());
+    EXPECT_EQ(text("VoucherDate"), Variant("07/12/2026"));
+    EXPECT_EQ(focused(), "VoucherDate");
+
+    // Days outside the financial year cannot be picked.
+    key(kF4);
+    ASSERT_TRUE(session->calendar_open());
+    for (int i = 0; i < 4; ++i) key(mini::kVkPageDown);
+    key(mini::kVkEnter);
+    EXPECT_TRUE(session->calendar_open());
+    EXPECT_NE(session->status().find("pick a day 01/04/2026 to 31/03/2027"), std::string::npos) << session->status();
+    key(mini::kVkEscape);
+    EXPECT_FALSE(session->calendar_open());
+    EXPECT_EQ(text("VoucherDate"), Variant("07/12/2026"));
+}
+
+TEST_F(SessionTest, AFailedDateCheckKeepsFocusOnceAndExplains) {
+    session->handle(Input::click_at(kPeriodRow, 3));  // on the label
+    ASSERT_EQ(focused(), "Period");
+    type(U"1326");
+    tab();
+    EXPECT_EQ(focused(), "Period");
+    EXPECT_TRUE(logged("event Period.DateError"));
+    EXPECT_NE(session->status().find("Period"), std::string::npos) << session->status();
+    tab();  // the person insists: the form lets the box go
+    EXPECT_EQ(focused(), "Payee");
+
+    // Finishing checks the box the same way.
+    session->handle(Input::click_at(kPeriodRow, 3));
+    type(U"13");
+    EXPECT_EQ(key(kF10), TerminalSession::Outcome::going_on);
+    EXPECT_EQ(focused(), "Period");
+    EXPECT_NE(session->status().find("F10 again"), std::string::npos) << session->status();
+    EXPECT_EQ(key(kF10), TerminalSession::Outcome::finished);
+}
+
+TEST_F(SessionTest, StatusLineExplainsRefusedKeys) {
+    tab(2);
+    ASSERT_EQ(focused(), "Amount");
+    type(U"12x");
+    EXPECT_TRUE(logged("event Amount.ControlError"));
+    EXPECT_NE(session->status().find("Amount (Rs): that key is not taken here"), std::string::npos) << session->status();
+    EXPECT_EQ(text("Amount"), Variant(12.0));
+
+    // A character outside Windows-1252 is refused; one inside it is typed.
+    key(mini::kVkTab, kShiftMask);
+    key(mini::kVkTab, kShiftMask);
+    ASSERT_EQ(focused(), "Payee");
+    type(U"\u0101");
+    EXPECT_NE(session->status().find("cannot be typed"), std::string::npos) << session->status();
+    EXPECT_EQ(text("Payee"), Variant(""));
+    type(U"\u00e9\u20ac");
+    EXPECT_EQ(text("Payee"), Variant("\xC9\x80"));
+    EXPECT_NE(row(kPayeeRow).find("\u00c9\u20ac"), std::string::npos) << row(kPayeeRow);
+}
+
+TEST_F(SessionTest, InsertTogglesOverwriteShownOnTheStatusLine) {
+    Canvas c = screen();
+    EXPECT_NE(c.row_text(23).find("INS"), std::string::npos);
+    key(mini::kVkInsert);
+    EXPECT_NE(screen().row_text(23).find("OVR"), std::string::npos);
+    type(U"abc");
+    key(mini::kVkHome);
+    type(U"x");
+    EXPECT_EQ(text("Payee"), Variant("Xbc"));
+}
+
+TEST_F(SessionTest, ClicksFocusFieldsAndPressTheSpinButtons) {
+    session->handle(Input::click_at(kAmountRow, 20));
+    ASSERT_EQ(focused(), "Amount");
+    type(U"500");
+    click_on(kAmountRow, U'▲');
+    EXPECT_EQ(text("Amount"), Variant(600.0));
+    click_on(kAmountRow, U'▼');
+    click_on(kAmountRow, U'▼');
+    EXPECT_EQ(text("Amount"), Variant(400.0));
+    key(mini::kVkUp, kAltMask);
+    EXPECT_EQ(text("Amount"), Variant(500.0));
+    click_on(kPayModeRow, U'▼');
+    EXPECT_EQ(focused(), "PayMode");
+    EXPECT_TRUE(session->list_open());
+    session->handle(Input::click_at(kPayModeRow + 5, 21));  // the fourth entry, under the frame
+    EXPECT_EQ(text("PayMode"), Variant("UPI"));
+}
+
+TEST_F(SessionTest, EventsPaneAndLeaving) {
+    key(kF2);
+    type(U"a");
+    EXPECT_TRUE(session->events_shown());
+    Canvas c = screen();
+    bool pane = false, event = false;
+    for (int r = 0; r < c.rows(); ++r) {
+        pane = pane || c.row_text(r).find("Events (F2 hides)") != std::string::npos;
+        event = event || c.row_text(r).find("event Payee.KeyPress KeyAscii=97") != std::string::npos;
+    }
+    EXPECT_TRUE(pane);
+    EXPECT_TRUE(event);
+    key(kF2);
+    EXPECT_FALSE(session->events_shown());
+    EXPECT_EQ(key(mini::kVkEscape), TerminalSession::Outcome::quit);
+    EXPECT_EQ(key('Q', mini::kCtrlMask), TerminalSession::Outcome::quit);
+    EXPECT_EQ(key('S', mini::kCtrlMask), TerminalSession::Outcome::finished);
+}
+
+TEST_F(SessionTest, TinyAndHugeScreensDrawWithoutHarm) {
+    for (auto [rows, cols] : {std::pair{1, 1}, {3, 10}, {24, 20}, {200, 300}}) {
+        Canvas c(rows, cols);
+        session->render(c);
+        session->handle(Input::click_at(rows - 1, cols - 1));
+        session->handle(Input::click_at(-5, 1000));
+    }
+    key(kF4);  // nothing drops down from the payee box
+    EXPECT_FALSE(session->calendar_open());
+    EXPECT_FALSE(session->list_open());
+}
+
+TEST(JsonString, EscapesAndConvertsToUtf8) {
+    EXPECT_EQ(json_string("a\"b\\c\n\x01\xE9\x80"), "\"a\\\"b\\\\c\\n\\u0001\u00e9\u20ac\"");
+}
+
+}  // namespace
+}  // namespace kel::kelform
