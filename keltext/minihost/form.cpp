@@ -29,6 +29,7 @@ public:
     int16_t key_state(int16_t virtual_key) const override {
         return virtual_key == kVkInsert && insert_ ? 1 : 0;
     }
+    int& handler_depth() override { return handler_depth_; }
 
     MiniSite& site_of(HostedControl& c);
     MiniSite* find(std::string_view name);
@@ -50,8 +51,6 @@ public:
     // How many synthetic keystrokes one round of delivery takes: controls whose keystrokes
     // queue further keystrokes without end are stopped here instead of hanging the form.
     static constexpr std::size_t kMaxSentKeys = 10000;
-    // "Out of stack space": what runaway send-keys loops are reported as.
-    static constexpr int kRunawayKeys = 28;
 
     FormObserver* observer_;
     bool user_mode_ = true;
@@ -61,6 +60,7 @@ public:
     MiniSite* focused_ = nullptr;
     std::deque<SentKey> queue_;
     bool delivering_ = false;
+    int handler_depth_ = 0;
 };
 
 namespace {
@@ -217,7 +217,7 @@ void FormImpl::run_pending() {
         if (!focused_) continue;  // nobody to take it: dropped
         if (++delivered > kMaxSentKeys) {
             queue_.clear();
-            if (observer_) observer_->handler_error(focused_->name() + ".surface.SendKeys", kRunawayKeys);
+            if (observer_) observer_->handler_error(focused_->name() + ".surface.SendKeys", kOutOfStackSpace);
             break;
         }
         switch (k.kind) {

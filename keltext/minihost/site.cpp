@@ -102,6 +102,12 @@ void MiniSite::handler_error(std::string_view part, std::string_view notificatio
     if (auto* o = form_.observer()) o->handler_error(name_ + "." + std::string(part) + "." + std::string(notification), number);
 }
 
+bool MiniSite::enter_handler() {
+    if (form_.handler_depth() >= kMaxHandlerDepth) return false;
+    ++form_.handler_depth();
+    return true;
+}
+
 template <class W>
 W& MiniSite::add_part(std::string_view name) {
     auto w = std::make_unique<W>(*this, std::string(name), form_.next_handle(), surface_.Width(), surface_.Height());

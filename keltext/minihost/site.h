@@ -24,6 +24,8 @@ public:
     virtual int32_t next_handle() = 0;  // a distinct positive window handle
     virtual void queue_keys(HostedControl& from, std::string_view keys) = 0;
     virtual int16_t key_state(int16_t virtual_key) const = 0;
+    // How deep handlers run inside one another, over the whole form.
+    virtual int& handler_depth() = 0;
 };
 
 // The part "page" of a property page: its Changed flag, and the design-time services.
@@ -88,6 +90,9 @@ public:
 
     // WidgetContext
     void handler_error(std::string_view part, std::string_view notification, int number) override;
+    bool enter_handler() override;
+    void leave_handler() override { --form_.handler_depth(); }
+    static constexpr int kMaxHandlerDepth = 100;
 
     // For the form.
     bool is_page() const { return page_ != nullptr; }
@@ -100,6 +105,14 @@ public:
     // reported as "NAME.part.notification" and the form goes on.
     template <class F>
     void guarded(std::string_view part, std::string_view notification, F&& f) {
+        if (!enter_handler()) {
+            handler_error(part, notification, kOutOfStackSpace);
+            return;
+        }
+        struct Leave {
+            MiniSite& site;
+            ~Leave() { site.leave_handler(); }
+        } leave{*this};
         try {
             f();
         } catch (const RuntimeError& e) {

@@ -19,6 +19,8 @@ namespace kel::mini {
 
 // Error number for a write to a member that can only be read.
 inline constexpr int kReadOnlyProperty = 383;
+// "Out of stack space": handlers that notify each other without end are stopped with it.
+inline constexpr int kOutOfStackSpace = 28;
 
 // What a widget needs of the site that owns it.
 class WidgetContext {
@@ -26,6 +28,11 @@ public:
     virtual ~WidgetContext() = default;
     // A handler of the owner failed with a run-time error while the widget notified it.
     virtual void handler_error(std::string_view part, std::string_view notification, int number) = 0;
+    // Brackets each handler call. False when handlers already run too deep inside one
+    // another (a Change handler that changes the text again, without end): the handler is
+    // then not called and the failure is reported instead of the stack running out.
+    virtual bool enter_handler() { return true; }
+    virtual void leave_handler() {}
 };
 
 // A part the form can deliver a person's input to.
@@ -157,6 +164,14 @@ protected:
     // handling the notification: reported to the form, and the widget goes on.
     template <class F>
     void guarded(std::string_view notification, F&& f) {
+        if (!context_.enter_handler()) {
+            context_.handler_error(name_, notification, kOutOfStackSpace);
+            return;
+        }
+        struct Leave {
+            WidgetContext& context;
+            ~Leave() { context.leave_handler(); }
+        } leave{context_};
         try {
             f();
         } catch (const RuntimeError& e) {

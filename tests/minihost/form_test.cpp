@@ -317,6 +317,24 @@ TEST(Form, EndlessSentKeysAreStopped) {
     EXPECT_EQ(probe(a).txt().Text(), "k");
 }
 
+TEST(Form, HandlersThatNotifyEachOtherWithoutEndAreStopped) {
+    Recorder r;
+    Form f(&r);
+    HostedControl& a = f.create(probe_class(), "a");
+    r.hook = [&](HostedControl& c, std::string_view event, std::span<EventArg>) {
+        if (event == "Change") probe(c).txt().Text(probe(c).txt().Text() + "x");
+    };
+    a.part("txtProbe")->poke("Text", "go");
+    Lines log = r.take();
+    EXPECT_EQ(std::count(log.begin(), log.end(), "a.txtProbe.Change -> error 28"), 1);
+    std::size_t length = probe(a).txt().Text().size();
+    EXPECT_GT(length, 10u);
+    r.hook = nullptr;
+    f.focus(&a);
+    f.keystroke(keystroke_for_char('k'));  // the form still works
+    EXPECT_EQ(probe(a).txt().Text().size(), length + 1);
+}
+
 TEST(Form, HandlerErrorsAreReportedWhereTheyHappen) {
     Recorder r;
     Form f(&r);
