@@ -143,7 +143,11 @@ TerminalSession::~TerminalSession() { form_.set_observer(nullptr); }
 
 std::string TerminalSession::label_of(const HostedControl& control) const {
     for (const ControlSpec& c : spec_.controls)
-        if (same_name(c.name, control.name()) && !c.label.empty()) return c.label;
+        if (same_name(c.name, control.name()) && !c.label.empty()) {
+            // "Amount (Rs)" is "Amount" on the status line.
+            const auto paren = c.label.find(" (");
+            return paren == std::string::npos || paren == 0 ? c.label : c.label.substr(0, paren);
+        }
     return control.name();
 }
 
@@ -165,17 +169,17 @@ void TerminalSession::event_raised(HostedControl& control, int /*number*/, std::
         if (decimals && length) {
             const int d = static_cast<int>(decimals->number());
             const int n = static_cast<int>(length->number());
-            rule = d > 0 ? "at most " + std::to_string(std::max(n - d - 1, 0)) + " digits, a point and " +
+            rule = d > 0 ? "up to " + std::to_string(std::max(n - d - 1, 0)) + " digits, a point and " +
                                std::to_string(d) + " decimals"
-                         : "at most " + std::to_string(n) + " digits";
+                         : "up to " + std::to_string(n) + " digits";
         }
-        say(label_of(control) + ": that key is not taken here (" + rule + ")");
+        say(label_of(control) + ": key refused - " + rule);
     } else if (same_name(event, "DateError")) {
         const auto style = property(control, "DateStyle");
         if (style && style->number() == 1)
-            say(label_of(control) + ": enter a month 01 to 12 and a two-digit year (mm/yy)");
+            say(label_of(control) + ": give a month 01-12 and a two-digit year (mm/yy)");
         else
-            say(label_of(control) + ": not a date (dd/mm/yyyy) the form can take");
+            say(label_of(control) + ": not a real date (dd/mm/yyyy)");
     } else if (same_name(event, "ButtonClick")) {
         open_calendar(control);
     }
@@ -197,8 +201,8 @@ void TerminalSession::keep_failed_date(HostedControl* left) {
     // Entering the box again clears the flag, so a second attempt to leave is let through:
     // the form insists once and explains, it never locks the person in.
     form_.focus(left);
-    if (status_.empty()) say(label_of(*left) + ": the date is not right; correct it, or leave again to keep it");
-    else status_ += "; focus stays until it is corrected (or you leave again)";
+    if (status_.empty()) say(label_of(*left) + ": the date is not right");
+    status_ += " - focus stays; leave again to keep it";
 }
 
 // ---- input ---------------------------------------------------------------------------------
@@ -238,7 +242,7 @@ bool TerminalSession::finish_focus() {
     if (allow && allow->number() == 0) {
         form_.focus(left);
         const std::string why = status_.empty() ? label_of(*left) + ": the date is not right" : status_;
-        say(why + "; correct it, or press F10 again to finish as it is");
+        say(why + " - F10 again finishes as it is");
         return false;
     }
     return true;

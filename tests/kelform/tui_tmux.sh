@@ -1,0 +1,162 @@
+#!/usr/bin/env bash
+# Drives `kelform` in a real terminal (a private tmux server) as a person would: types into
+# every field of the demo voucher, checks what the screen shows, finishes with F10 and checks
+# the JSON printed; then runs a form file, checks it is saved, and leaves one with Escape.
+# usage: tui_tmux.sh KELFORM VOUCHER.kform
+# Exit 77 (skipped) when tmux is missing.
+set -euo pipefail
+
+kelform=$1
+voucher=$2
+if ! command -v tmux >/dev/null 2>&1; then
+  echo "tmux is not installed: skipping the terminal test (tools/setup installs it)"
+  exit 77
+fi
+
+work=$(mktemp -d)
+sock=$work/tmux.sock
+unset TMUX
+tm() { tmux -S "$sock" -f /dev/null "$@"; }
+cleanup() { tm kill-server >/dev/null 2>&1 || true; rm -rf "$work"; }
+trap cleanup EXIT
+
+fail() {
+  echo "FAIL: $*"
+  echo "---- screen ----"
+  tm capture-pane -p -t kf 2>/dev/null || echo "(no screen)"
+  echo "----------------"
+  exit 1
+}
+
+# Starts kelform with the given arguments in a fresh 80x24 terminal; its standard output goes
+# to $work/out, its exit status to $work/status.
+start() {
+  rm -f "$work/out" "$work/status"
+  tm kill-server >/dev/null 2>&1 || true
+  tm new-session -d -s kf -x 80 -y 24 \
+    "cd '$work' && LANG=C.UTF-8 LC_ALL=C.UTF-8 '$kelform' $* > '$work/out'; echo \$? > '$work/status'; sleep 60"
+}
+
+screen() { tm capture-pane -p -t kf; }
+
+wait_for() {
+  local text=$1
+  for _ in $(seq 1 100); do
+    if screen | grep -qF -- "$text"; then return 0; fi
+    sleep 0.1
+  done
+  fail "the screen never showed '$text'"
+}
+
+# The line of the screen that holds a label.
+line_of() { screen | grep -F -- "$1" | head -n 1; }
+
+expect_line() {
+  local label=$1 text=$2
+  for _ in $(seq 1 50); do
+    if line_of "$label" | grep -qF -- "$text"; then return 0; fi
+    sleep 0.1
+  done
+  fail "the line of '$label' does not show '$text': '$(line_of "$label")'"
+}
+
+send() { tm send-keys -t kf "$@"; sleep 0.15; }
+
+wait_exit() {
+  for _ in $(seq 1 100); do
+    if [ -s "$work/status" ]; then cat "$work/status"; return 0; fi
+    sleep 0.1
+  done
+  fail "kelform did not end"
+}
+
+# The voucher date must fall in the current financial year (April to March).
+month=$(date +%m)
+year=$(date +%Y)
+if [ "${month#0}" -lt 4 ]; then fy=$((year - 1)); else fy=$year; fi
+
+# ---- 1. the demo form, every field, F10 --------------------------------------------------
+start
+wait_for "Payment voucher"
+wait_for "F10 finish"
+send -l "ramesh kumar"
+expect_line "Payee name" "Ramesh Kumar"
+send Tab
+send -l "abcde1234f"
+expect_line "PAN" "ABCDE1234F"
+send Tab
+send -l "1234567.5"
+send Tab
+expect_line "Amount (Rs)" "12,34,567.50"          # grouped when focus left the box
+send -l "3104$fy"
+send Tab
+expect_line "Voucher date" "30/04/$fy"            # 31 April corrected to the 30th
+send -l "ch"
+expect_line "Pay mode" "Cheque"                   # completed from the list
+send Tab
+send -l "123456"
+send Tab
+send -l "1326"
+send Tab
+wait_for "two-digit year"                         # the form's status line on DateError
+send Home
+send -l "0526"
+send F2
+wait_for "Events (F2 hides)"
+send F2
+send F10
+status=$(wait_exit)
+[ "$status" = 0 ] || fail "exit status $status after F10"
+expected=$(cat <<EOF
+{
+  "Payee": "Ramesh Kumar",
+  "PAN": "ABCDE1234F",
+  "Amount": 1234567.5,
+  "VoucherDate": "30/04/$fy",
+  "PayMode": "Cheque",
+  "ChequeNo": "123456",
+  "Period": "05/26 "
+}
+EOF
+)
+actual=$(cat "$work/out")
+if [ "$actual" != "$expected" ]; then
+  echo "expected:"; echo "$expected"; echo "printed:"; echo "$actual"
+  fail "the JSON printed differs"
+fi
+
+# ---- 2. a form file: the combo list, the calendar, saved on F10 ---------------------------
+cp "$voucher" "$work/v.kform"
+start run v.kform
+wait_for "Payment voucher"
+send -l "anil"
+send Tab Tab Tab Tab
+send F4                                           # the combo's list
+wait_for "UPI"
+send Down Down Enter
+expect_line "Pay mode" "Card"
+send BTab
+send F4                                           # the calendar of the voucher date
+wait_for "Su Mo Tu We Th Fr Sa"
+send Home Enter
+day1=$(date +01/%m/%Y)
+expect_line "Voucher date" "$day1"
+send F10
+status=$(wait_exit)
+[ "$status" = 0 ] || fail "exit status $status after F10 on a form file"
+grep -qF '"Payee": "Anil"' "$work/out" || fail "payee not printed: $(cat "$work/out")"
+grep -qF "\"VoucherDate\": \"$day1\"" "$work/out" || fail "calendar day not printed: $(cat "$work/out")"
+grep -qF 'store Text "Anil"' "$work/v.kform" || fail "the form file was not saved with the payee"
+
+# ---- 3. Escape leaves without printing or saving -------------------------------------------
+cp "$work/v.kform" "$work/before.kform"
+start run v.kform
+wait_for "Payment voucher"
+send -l "x"
+send Escape
+status=$(wait_exit)
+[ "$status" = 1 ] || fail "exit status $status after Escape"
+[ ! -s "$work/out" ] || fail "Escape printed: $(cat "$work/out")"
+cmp -s "$work/v.kform" "$work/before.kform" || fail "Escape changed the form file"
+
+echo "kelform in tmux: all steps passed"
