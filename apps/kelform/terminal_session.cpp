@@ -572,7 +572,7 @@ std::vector<TerminalSession::Layout> TerminalSession::layout(int rows, int cols)
         l.control = c;
         l.spec = &spec;
         Part& surface = c->surface_part();
-        l.field = {spec.row, spec.col - 1, 1, std::max(cells(peek_number(&surface, "Width")), 1)};
+        l.field = {spec.row - top_, spec.col - 1, 1, std::max(cells(peek_number(&surface, "Width")), 1)};
         Part* edit = c->keyboard_part();
         const int edit_left = edit ? cells(peek_number(edit, "Left")) : 0;
         int edit_width = edit ? cells(peek_number(edit, "Width")) : l.field.width;
@@ -589,9 +589,9 @@ std::vector<TerminalSession::Layout> TerminalSession::layout(int rows, int cols)
             l.image_col = l.field.col + cells(peek_number(image, "Left"));
         const int label_len = static_cast<int>(spec.label.size());
         if (spec.label_row && spec.label_col)
-            l.label = {*spec.label_row, *spec.label_col - 1, 1, label_len};
+            l.label = {*spec.label_row - top_, *spec.label_col - 1, 1, label_len};
         else
-            l.label = {spec.row, std::max(l.field.col - label_len - 1, 0), 1, label_len};
+            l.label = {l.field.row, std::max(l.field.col - label_len - 1, 0), 1, label_len};
         // The field may be wider than its parts: clicks count on what is drawn.
         int right = l.edit.col + l.edit.width;
         if (l.spin_col) right = std::max(right, *l.spin_col + 2);
@@ -748,20 +748,31 @@ void TerminalSession::draw_calendar(Canvas& canvas, const Rect& r) {
 void TerminalSession::render(Canvas& canvas) {
     rows_ = canvas.rows();
     cols_ = canvas.cols();
-    last_layout_ = layout(rows_, cols_);
     HostedControl* focused = form_.focused();
+    // A form taller than the screen scrolls so that the focused field stays in view, between
+    // the title bar and the help line.
+    const int pane_height = events_shown_ ? std::max((rows_ - 3) / 3, 4) : 0;
+    const int last_row = std::max(rows_ - 3 - pane_height, 1);
+    if (focused)
+        for (const ControlSpec& c : spec_.controls)
+            if (same_name(c.name, focused->name())) {
+                if (c.row - top_ > last_row) top_ = c.row - last_row;
+                if (c.row - top_ < 1) top_ = c.row - 1;
+            }
+    top_ = std::max(top_, 0);
+    last_layout_ = layout(rows_, cols_);
 
+    for (const Layout& l : last_layout_) draw_control(canvas, l, l.control == focused);
+
+    // The bars are drawn over whatever of the form scrolled under them.
     CellStyle bar;
     bar.reverse = true;
     canvas.fill(0, 0, 1, cols_, bar);
     canvas.put_text(0, 1, spec_.title, bar, std::max(cols_ - 12, 0));
     canvas.put_text(0, std::max(cols_ - 8, 0), "kelform", bar);
 
-    for (const Layout& l : last_layout_) draw_control(canvas, l, l.control == focused);
-
     if (events_shown_) {
-        const int height = std::max((rows_ - 3) / 3, 4);
-        const int top = std::max(rows_ - 2 - height, 1);
+        const int top = std::max(rows_ - 2 - pane_height, 1);
         CellStyle pane;
         canvas.fill(top, 0, rows_ - 2 - top, cols_, pane);
         CellStyle rule;

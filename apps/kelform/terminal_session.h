@@ -129,6 +129,7 @@ private:
     std::optional<ListPopup> list_;
     std::map<std::string, int> scroll_;  // first text position shown, per control
     int rows_ = 24, cols_ = 80;          // the size last drawn, for clicks
+    int top_ = 0;                        // form rows scrolled off the top
     std::vector<Layout> last_layout_;
     bool finishing_ = false;
 };

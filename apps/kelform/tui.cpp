@@ -21,6 +21,7 @@
 #include <cstring>
 #include <cwchar>
 #include <map>
+#include <string>
 #include <memory>
 #include <utility>
 
@@ -228,6 +229,12 @@ public:
             const int r2 = get_wch(&next);
             timeout(-1);
             if (r2 == ERR) return Input::key_of(mini::kVkEscape);
+            if (r2 == OK && (next == '[' || next == 'O')) {
+                // An escape sequence curses does not know (a key with modifiers it has no name
+                // for, a mouse report in SGR form): read it whole so that none of it is typed.
+                if (auto in = unknown_sequence(static_cast<wchar_t>(next))) return in;
+                return std::nullopt;
+            }
             std::optional<Input> in = r2 == KEY_CODE_YES ? key_code(static_cast<int>(next)) : character_key(next);
             if (!in) return std::nullopt;
             if (in->kind == Input::Kind::character) {
@@ -243,6 +250,31 @@ public:
     }
 
 private:
+    std::optional<Input> unknown_sequence(wchar_t introducer) {
+        std::wstring body;
+        timeout(30);
+        for (int i = 0; i < 32; ++i) {
+            wint_t c = 0;
+            if (get_wch(&c) != OK) break;
+            body += static_cast<wchar_t>(c);
+            // The final byte of a control sequence; after ESC O a single key follows.
+            if (introducer == 'O' || (c >= 0x40 && c <= 0x7E)) break;
+        }
+        timeout(-1);
+        if (body.empty()) {
+            // Alt with '[' or 'O' alone.
+            return Input::key_of(introducer == '[' ? int16_t{219} : int16_t{'O'}, kAltMask);
+        }
+        // SGR mouse report: ESC [ < button ; column ; row M (press) or m (release).
+        int button = 0, x = 0, y = 0;
+        wchar_t final = 0;
+        if (introducer == '[' && body[0] == L'<' &&
+            std::swscanf(body.c_str() + 1, L"%d;%d;%d%lc", &button, &x, &y, &final) == 4 && final == L'M' &&
+            button == 0)
+            return Input::click_at(y - 1, x - 1);
+        return std::nullopt;
+    }
+
     std::optional<Input> key_code(int code) {
         if (code == KEY_RESIZE) return std::nullopt;
         if (code == KEY_MOUSE) {
