@@ -154,7 +154,10 @@ void Player::add_builtin_commands() {
         {"trace", &Player::cmd_trace},     {"echo", &Player::cmd_echo},       {"expect", &Player::cmd_expect},
         {"page", &Player::cmd_page},       {"apply", &Player::cmd_apply},
     };
-    for (const auto& [name, fn] : simple) add_command(name, [fn](Player& p, Args& a) { (p.*fn)(a); });
+    for (const auto& entry : simple) {
+        M fn = entry.second;
+        add_command(entry.first, [fn](Player& p, Args& a) { (p.*fn)(a); });
+    }
     add_command("new", [](Player& p, Args& a) { p.cmd_new(a, false); });
     add_command("load", [](Player& p, Args& a) { p.cmd_new(a, true); });
     add_command("keydown", [](Player& p, Args& a) { p.cmd_key_half(a, true); });
