@@ -87,28 +87,6 @@ protected:
 
 // ---- a new control, saving and loading --------------------------------------------------------
 
-TEST_F(ComboTest, NewControl) {
-    HostedControl& c = form.create(cls, "c", 300, 100);
-    EXPECT_EQ(get(c, "AutoSearch"), Variant(true));
-    EXPECT_EQ(get(c, "TextType"), Variant(int32_t{0}));
-    EXPECT_EQ(get(c, "MaxLength"), Variant(int16_t{0}));
-    EXPECT_EQ(get(c, "Enabled"), Variant(true));
-    EXPECT_EQ(get(c, "Locked"), Variant(false));
-    EXPECT_EQ(get(c, "ListCount"), Variant(int16_t{0}));
-    EXPECT_EQ(c.surface_part().peek("Width"), Variant(540.0f));
-    EXPECT_EQ(c.surface_part().peek("Height"), Variant(353.0f));
-    EXPECT_EQ(peek(c, "Width"), Variant(540.0f));
-    EXPECT_EQ(peek(c, "BackColor"), Variant(int32_t{0xFFECC8}));
-    EXPECT_EQ(peek(c, "ForeColor"), Variant(int32_t{0xC00000}));
-
-    const mini::StoredValues saved = form.save(c);
-    std::vector<std::string> keys;
-    for (const auto& [k, v] : saved) keys.push_back(k);
-    EXPECT_EQ(keys, (std::vector<std::string>{"Backcolor", "Font", "AutoSearch"}));
-    EXPECT_EQ(saved[0].second, Variant(int32_t{0xFFECC8}));
-    EXPECT_EQ(saved[2].second, Variant(true));
-}
-
 TEST_F(ComboTest, LoadRebuildsTheListThenSetsTheText) {
     HostedControl& c = form.load(cls, "c", {{"FillList", Variant(L("A[201]1[200]B[201]2[200]"))}});
     EXPECT_EQ(get(c, "ListCount"), Variant(int16_t{2}));
@@ -179,15 +157,6 @@ TEST_F(ComboTest, SpaceCompletesAndSortedListStopsEarly) {
     EXPECT_EQ(text(c), "X");
 }
 
-TEST_F(ComboTest, AutoSearchOffRaisesKeyUpOnly) {
-    HostedControl& c = focused({"Banana"});
-    set(c, "AutoSearch", Variant(false));
-    rec.events.clear();
-    type("b");
-    EXPECT_EQ(text(c), "B");
-    EXPECT_EQ(rec.events.back(), "7 KeyUp 66 0");
-}
-
 TEST_F(ComboTest, SearchLeavesADropDownListAlone) {
     HostedControl& c = add({"Banana"});
     poke(c, "Style", Variant(int16_t{2}));
@@ -221,38 +190,6 @@ TEST_F(ComboTest, DownInAnEmptyListIsConsumed) {
 
 // ---- the character filter ---------------------------------------------------------------------
 
-TEST_F(ComboTest, TitleCaseAsTyped) {
-    HostedControl& c = focused({});
-    set(c, "AutoSearch", Variant(false));
-    type("john smith");
-    EXPECT_EQ(text(c), "John Smith");
-    form.select(c, 1, 0);
-    form.set_insert(true);
-    type("x");
-    EXPECT_EQ(text(c), "Jxhn Smith");
-}
-
-TEST_F(ComboTest, FilterByType) {
-    struct Case {
-        int32_t type;
-        const char* typed;
-        const char* text;
-    } cases[] = {
-        {KelCboUserKeys, "aB c", "aB c"},      {KelCboUpperCase, "ab-c", "AB-C"},
-        {KelCboUAlphaNumeric, "a5 .-b", "A5 B"}, {KelCboSentence, "ab", "Ab"},
-        {KelCboDigits, "7a .-,1", "7 .1"},
-    };
-    int n = 0;
-    for (const Case& k : cases) {
-        HostedControl& c = add({}, "c" + std::to_string(n++));
-        set(c, "AutoSearch", Variant(false));
-        set(c, "TextType", Variant(k.type));
-        form.focus(&c);
-        type(k.typed);
-        EXPECT_EQ(text(c), k.text) << k.type;
-    }
-}
-
 TEST_F(ComboTest, MaxLengthRefusesKeysWithoutKeyPress) {
     HostedControl& c = focused({});
     set(c, "AutoSearch", Variant(false));
@@ -272,15 +209,6 @@ TEST_F(ComboTest, MaxLengthRefusesKeysWithoutKeyPress) {
     EXPECT_EQ(text(c), "z12");
 }
 
-TEST_F(ComboTest, EnterIsDroppedAfterKeyPress) {
-    HostedControl& c = focused({});
-    poke(c, "Text", Variant("ab"));
-    rec.events.clear();
-    key("Enter");
-    EXPECT_EQ(text(c), "ab");
-    EXPECT_NE(std::find(rec.events.begin(), rec.events.end(), "6 KeyPress 13"), rec.events.end());
-}
-
 TEST_F(ComboTest, AKeyTheFormDropsStaysDropped) {
     HostedControl& c = focused({});
     rec.on_event = [](std::string_view e, std::span<EventArg> args) {
@@ -288,24 +216,6 @@ TEST_F(ComboTest, AKeyTheFormDropsStaysDropped) {
     };
     type("ab");
     EXPECT_EQ(text(c), "");
-}
-
-TEST_F(ComboTest, CtrlBypassesTheFilter) {
-    HostedControl& c = focused({});
-    set(c, "AutoSearch", Variant(false));
-    form.key_down(17, 2);
-    rec.events.clear();
-    form.key_press('a');
-    EXPECT_EQ(text(c), "a");
-    EXPECT_TRUE(rec.events.empty() || rec.events.front().find("KeyPress") == std::string::npos);
-}
-
-TEST_F(ComboTest, FocusSelectsTheTextWithoutTrailingSpaces) {
-    HostedControl& c = add({});
-    poke(c, "Text", Variant("Cash  "));
-    form.focus(&c);
-    EXPECT_EQ(sel_start(c), 0);
-    EXPECT_EQ(sel_length(c), 4);
 }
 
 // ---- properties and methods -------------------------------------------------------------------
@@ -326,14 +236,6 @@ TEST_F(ComboTest, ListAndItemDataTakeA16BitIndexOnly) {
     EXPECT_EQ(get(c, "ItemData", i0), Variant(7.0));
     EXPECT_EQ(get(c, "List", i0), Variant("A"));
     EXPECT_EQ(error_of([&] { get(c, "List", Variant(int16_t{5})); }), kInvalidPropertyIndex);
-}
-
-TEST_F(ComboTest, ListIndexErrors) {
-    HostedControl& c = add({"A"});
-    EXPECT_EQ(error_of([&] { set(c, "ListIndex", Variant("x")); }), kTypeMismatch);
-    EXPECT_EQ(error_of([&] { set(c, "ListIndex", Variant(int16_t{3})); }), kInvalidPropertyIndex);
-    EXPECT_EQ(error_of([&] { set(c, "ListIndex", Variant("0")); }), 0);
-    EXPECT_EQ(text(c), "A");
 }
 
 TEST_F(ComboTest, MaxLengthSetter) {
@@ -372,45 +274,6 @@ TEST_F(ComboTest, AddItemCutsToMaxLength) {
     EXPECT_EQ(get(c, "ListCount"), Variant(int16_t{1}));
     c.dispatch().call("Clear", {});
     EXPECT_EQ(get(c, "ListCount"), Variant(int16_t{0}));
-}
-
-TEST_F(ComboTest, FillListDoesNotTouchTheVisibleList) {
-    HostedControl& c = add({"A"});
-    set(c, "FillList", Variant(L("X[201]1[200]Y[201]2[200]")));
-    EXPECT_EQ(get(c, "FillList"), Variant(L("X[201]1[200]Y[201]2[200]")));
-    EXPECT_EQ(get(c, "ListCount"), Variant(int16_t{1}));
-}
-
-TEST_F(ComboTest, DesignModeTextIsTheSavedText) {
-    form.set_user_mode(false);
-    HostedControl& c = add({"Alpha", "Beta"});
-    set(c, "Text", Variant("Gamma"));
-    set(c, "ListIndex", Variant(int16_t{1}));
-    EXPECT_EQ(text(c), "Beta");
-    EXPECT_EQ(get(c, "Text"), Variant("Gamma"));
-    form.set_user_mode(true);
-    EXPECT_EQ(get(c, "Text"), Variant("Beta"));
-}
-
-TEST_F(ComboTest, EnabledAndLockedShareTheSurface) {
-    HostedControl& c = add({});
-    set(c, "Locked", Variant(true));
-    EXPECT_EQ(c.surface_part().peek("Enabled"), Variant(false));
-    set(c, "Enabled", Variant(true));
-    EXPECT_EQ(c.surface_part().peek("Enabled"), Variant(true));
-    EXPECT_EQ(get(c, "Locked"), Variant(true));
-}
-
-TEST_F(ComboTest, SelectionProperties) {
-    HostedControl& c = add({});
-    set(c, "Text", Variant("Hello"));
-    set(c, "SelStart", Variant("x"));
-    set(c, "SelStart", Variant(int16_t{1}));
-    set(c, "Sellength", Variant(3.0));
-    EXPECT_EQ(get(c, "SelText"), Variant("ell"));
-    EXPECT_EQ(get(c, "SelStart"), Variant(int32_t{1}));
-    EXPECT_EQ(error_of([&] { set(c, "SelStart", Variant(int16_t{-1})); }), kInvalidPropertyValue);
-    EXPECT_EQ(get(c, "hWnd"), c.surface_part().peek("hWnd"));
 }
 
 }  // namespace

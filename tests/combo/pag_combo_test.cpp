@@ -184,22 +184,5 @@ TEST_F(PageTest, ApplyWritesTheFirstSelectedControlOnly) {
     EXPECT_EQ(d.dispatch().get("Locked"), Variant(false));
 }
 
-TEST_F(PageTest, ApplyIgnoresAMaxLengthThatIsNoNumber) {
-    HostedControl& c = combo("c", "");
-    c.dispatch().set("MaxLength", Variant(int16_t{4}));
-    HostedControl& pg = open({&c});
-    type_into(pg, "txtMaxLength", "lots");
-    type_into(pg, "txtList", "\xC9" "cole");
-    click(pg, "cmdAdd");
-    pg.part("chkLocked")->poke("Value", Variant(int16_t{1}));
-    form.apply_page(pg);
-    EXPECT_EQ(c.dispatch().get("MaxLength"), Variant(int16_t{4}));
-    EXPECT_EQ(c.dispatch().get("Locked"), Variant(true));
-    // A letter of separator code travels to the combo and back intact.
-    HostedControl& again = form.load(combo_class, "again", {{"FillList", c.dispatch().get("FillList")}});
-    const Variant first(int16_t{0});
-    EXPECT_EQ(again.dispatch().get("List", &first), Variant("\xC9" "cole"));
-}
-
 }  // namespace
 }  // namespace kel
