@@ -77,10 +77,29 @@ void print_usage(std::ostream& out) {
            "       kelform --help                 show this help\n"
            "       kelform --version              show the version\n"
            "\n"
-           "commands:\n"
-           "  run   open a form file in the terminal\n"
-           "  play  run form scripts; exit status 0 when all ran and every expect held,\n"
-           "        1 when an expect failed, 2 when a script could not be read or has an error\n";
+           "play exits with 0 when every script ran and every expect held, 1 when an expect\n"
+           "failed, 2 when a script could not be read or has an error (FILE:LINE: message).\n"
+           "\n"
+           "script commands (one a line, # starts a comment):\n"
+           "  mode design|run                       new CLASS NAME [width height]\n"
+           "  load CLASS NAME [width height] [Key=value ...]\n"
+           "  save NAME                             resize NAME width height\n"
+           "  set NAME.Prop[(index)] value          get NAME.Prop[(index)]\n"
+           "  call NAME.Method [values ...]         peek NAME.part.Member[(index)]\n"
+           "  poke NAME.part.Member[(index)] value  focus NAME|none\n"
+           "  type \"text\"    key KEY    keydown KEY    keyup KEY    keypress CODE\n"
+           "  insert on|off    paste \"text\"    select NAME start length\n"
+           "  click NAME.part    dblclick NAME.part    notify NAME.part.Notification\n"
+           "  mousedown NAME.part button shift x y    mouseup NAME.part button shift x y\n"
+           "  on NAME.Event ACTION    off NAME.Event\n"
+           "      ACTION: set ARG value | set NAME.Prop value | get NAME.Prop | echo \"text\"\n"
+           "  trace events|sendkeys|changed on|off    echo \"text\"    expect EXPR value|error:N\n"
+           "  page PAGE NAME [NAME ...]    apply PAGE\n"
+           "  loadform FILE    saveform FILE\n"
+           "\n"
+           "values: empty true false 12 -7 0xC00000 12.5 1e3 \"text\" u8:5 i16:5 i32:5 f32:2.5\n"
+           "        f64:2.5 date:2003-01-31 font:\"Arial\":12[:bold][:italic]\n"
+           "strings: \\\" \\\\ \\t \\n \\r \\xHH (one byte of Windows-1252)\n";
 }
 
 void print_version(std::ostream& out) { out << "kelform " << version() << '\n'; }
