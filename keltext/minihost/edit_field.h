@@ -108,11 +108,13 @@ protected:
 
     // Replaces the selection by `piece`, caret after it, and raises Change when the text changed.
     void replace_selection(const std::string& piece) {
-        std::string before = text_;
-        text_.replace(static_cast<std::size_t>(sel_start_), static_cast<std::size_t>(sel_length_), piece);
+        const auto start = static_cast<std::size_t>(sel_start_);
+        const auto count = static_cast<std::size_t>(sel_length_);
+        const bool changed = text_.compare(start, count, piece) != 0;
+        text_.replace(start, count, piece);
         sel_start_ += static_cast<int32_t>(piece.size());
         sel_length_ = 0;
-        if (text_ != before) this->fire_change();
+        if (changed) this->fire_change();
     }
 
     virtual void type_char(char c) {
