@@ -131,7 +131,6 @@ private:
     int rows_ = 24, cols_ = 80;          // the size last drawn, for clicks
     int top_ = 0;                        // form rows scrolled off the top
     std::vector<Layout> last_layout_;
-    bool finishing_ = false;
 };
 
 // A JSON string literal of a text in the host's single-byte set.
