@@ -90,6 +90,13 @@ void MiniSite::property_changed(std::string_view name) {
 void MiniSite::raise_event(int number, std::string_view name, std::span<EventArg> args) {
     FormObserver* o = form_.observer();
     if (!o) return;
+    // The form's code may set properties that raise events again: without end, that is the
+    // control's error 28, as deep nesting of widget handlers is.
+    if (!enter_handler()) raise_error(kOutOfStackSpace);
+    struct Leave {
+        MiniSite& site;
+        ~Leave() { site.leave_handler(); }
+    } leave{*this};
     std::vector<Variant> given;
     given.reserve(args.size());
     for (const auto& a : args) given.push_back(a.value);

@@ -71,6 +71,8 @@ const ClassInfo& probe_class() {
     static const ClassInfo info = ClassBuilder<Probe>("Probe", "test control")
                                       .property("Text", "Variant", [](Probe& p) { return Variant(p.txt().Text()); },
                                                 [](Probe& p, const Variant& v) { p.txt().Text(text_of(v)); }, "")
+                                      .property("Ping", "Variant", [](Probe&) { return Variant(); },
+                                                [](Probe& p, const Variant&) { p.site().raise_event(9, "Ping", {}); }, "")
                                       .build();
     return info;
 }
@@ -333,6 +335,25 @@ TEST(Form, HandlersThatNotifyEachOtherWithoutEndAreStopped) {
     f.focus(&a);
     f.keystroke(keystroke_for_char('k'));  // the form still works
     EXPECT_EQ(probe(a).txt().Text().size(), length + 1);
+}
+
+TEST(Form, EventsRaisedAgainWithoutEndAreError28) {
+    Recorder r;
+    Form f(&r);
+    HostedControl& a = f.create(probe_class(), "a");
+    r.hook = [&](HostedControl& c, std::string_view event, std::span<EventArg>) {
+        if (event == "Ping") c.dispatch().set("Ping", Variant());
+    };
+    try {
+        a.dispatch().set("Ping", Variant());
+        ADD_FAILURE() << "no error";
+    } catch (const RuntimeError& e) {
+        EXPECT_EQ(e.number(), 28);
+    }
+    r.hook = nullptr;
+    r.take();
+    a.dispatch().set("Ping", Variant());  // and the next one is delivered again
+    EXPECT_EQ(r.take(), (Lines{"a.Ping"}));
 }
 
 TEST(Form, HandlerErrorsAreReportedWhereTheyHappen) {
