@@ -15,12 +15,12 @@ void MiniCheckBox::list_members(std::vector<std::string>& m) const {
 }
 
 std::optional<Variant> MiniCheckBox::peek_member(std::string_view m, std::optional<int32_t> index) const {
-    if (same_name(m, "Value")) return no_index(index), Variant(value_);
+    if (same_name(m, "Value")) return Variant(value_);
     return CaptionImpl::peek_member(m, index);
 }
 
 bool MiniCheckBox::poke_member(std::string_view m, const Variant& v, std::optional<int32_t> index) {
-    if (same_name(m, "Value")) return no_index(index), Value(to_int16(v)), true;
+    if (same_name(m, "Value")) { Value(to_int16(v)); return true; }
     return CaptionImpl::poke_member(m, v, index);
 }
 

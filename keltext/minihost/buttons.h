@@ -37,11 +37,11 @@ protected:
         m.push_back("Caption");
     }
     std::optional<Variant> peek_member(std::string_view m, std::optional<int32_t> index) const override {
-        if (same_name(m, "Caption")) return no_index(index), Variant(caption_);
+        if (same_name(m, "Caption")) return Variant(caption_);
         return Base::peek_member(m, index);
     }
     bool poke_member(std::string_view m, const Variant& v, std::optional<int32_t> index) override {
-        if (same_name(m, "Caption")) return no_index(index), Caption(text_of(v)), true;
+        if (same_name(m, "Caption")) { Caption(text_of(v)); return true; }
         return Base::poke_member(m, v, index);
     }
 

@@ -18,12 +18,12 @@ void MiniEditBox::list_members(std::vector<std::string>& m) const {
 }
 
 std::optional<Variant> MiniEditBox::peek_member(std::string_view m, std::optional<int32_t> index) const {
-    if (same_name(m, "MaxLength")) return no_index(index), Variant(max_length_);
+    if (same_name(m, "MaxLength")) return Variant(max_length_);
     return EditFieldImpl::peek_member(m, index);
 }
 
 bool MiniEditBox::poke_member(std::string_view m, const Variant& v, std::optional<int32_t> index) {
-    if (same_name(m, "MaxLength")) return no_index(index), MaxLength(to_int32(v)), true;
+    if (same_name(m, "MaxLength")) { MaxLength(to_int32(v)); return true; }
     return EditFieldImpl::poke_member(m, v, index);
 }
 

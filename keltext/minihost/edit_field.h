@@ -146,19 +146,18 @@ protected:
         m.insert(m.end(), {"Text", "SelStart", "SelLength", "SelText"});
     }
     std::optional<Variant> peek_member(std::string_view m, std::optional<int32_t> index) const override {
-        if (same_name(m, "Text")) return no_index(index), Variant(Text());
-        if (same_name(m, "SelStart")) return no_index(index), Variant(sel_start_);
-        if (same_name(m, "SelLength")) return no_index(index), Variant(sel_length_);
-        if (same_name(m, "SelText")) return no_index(index), Variant(SelText());
+        if (same_name(m, "Text")) return Variant(Text());
+        if (same_name(m, "SelStart")) return Variant(sel_start_);
+        if (same_name(m, "SelLength")) return Variant(sel_length_);
+        if (same_name(m, "SelText")) return Variant(SelText());
         return Base::peek_member(m, index);
     }
     bool poke_member(std::string_view m, const Variant& v, std::optional<int32_t> index) override {
-        if (same_name(m, "Text")) return no_index(index), Text(text_of(v)), true;
-        if (same_name(m, "SelStart")) return no_index(index), SelStart(to_int32(v)), true;
-        if (same_name(m, "SelLength")) return no_index(index), SelLength(to_int32(v)), true;
+        if (same_name(m, "Text")) { Text(text_of(v)); return true; }
+        if (same_name(m, "SelStart")) { SelStart(to_int32(v)); return true; }
+        if (same_name(m, "SelLength")) { SelLength(to_int32(v)); return true; }
         if (same_name(m, "SelText")) {
             // As a program's SelText assignment: the selection is replaced, unfiltered.
-            no_index(index);
             set_sel_text(text_of(v));
             return true;
         }

@@ -25,16 +25,16 @@ void list_member_names(std::vector<std::string>& m) {
 std::optional<Variant> peek_list(const ListWidget& w, std::string_view m, std::optional<int32_t> index) {
     if (same_name(m, "List")) return Variant(w.List(need_index(index)));
     if (same_name(m, "ItemData")) return Variant(w.ItemData(need_index(index)));
-    if (same_name(m, "ListIndex")) return no_index(index), Variant(w.ListIndex());
-    if (same_name(m, "ListCount")) return no_index(index), Variant(w.ListCount());
-    if (same_name(m, "NewIndex")) return no_index(index), Variant(w.NewIndex());
+    if (same_name(m, "ListIndex")) return Variant(w.ListIndex());
+    if (same_name(m, "ListCount")) return Variant(w.ListCount());
+    if (same_name(m, "NewIndex")) return Variant(w.NewIndex());
     return std::nullopt;
 }
 
 bool poke_list(ListWidget& w, std::string_view m, const Variant& v, std::optional<int32_t> index) {
-    if (same_name(m, "List")) return w.List(need_index(index), text_of(v)), true;
-    if (same_name(m, "ItemData")) return w.ItemData(need_index(index), to_int32(v)), true;
-    if (same_name(m, "ListIndex")) return no_index(index), w.ListIndex(to_int32(v)), true;
+    if (same_name(m, "List")) { w.List(need_index(index), text_of(v)); return true; }
+    if (same_name(m, "ItemData")) { w.ItemData(need_index(index), to_int32(v)); return true; }
+    if (same_name(m, "ListIndex")) { w.ListIndex(to_int32(v)); return true; }
     if (same_name(m, "ListCount") || same_name(m, "NewIndex")) read_only_member();
     return false;
 }
@@ -157,15 +157,15 @@ void MiniComboBox::list_members(std::vector<std::string>& m) const {
 
 std::optional<Variant> MiniComboBox::peek_member(std::string_view m, std::optional<int32_t> index) const {
     if (auto v = peek_list(*this, m, index)) return v;
-    if (same_name(m, "Style")) return no_index(index), Variant(style_);
-    if (same_name(m, "Sorted")) return no_index(index), Variant(sorted_);
+    if (same_name(m, "Style")) return Variant(style_);
+    if (same_name(m, "Sorted")) return Variant(sorted_);
     return EditFieldImpl::peek_member(m, index);
 }
 
 bool MiniComboBox::poke_member(std::string_view m, const Variant& v, std::optional<int32_t> index) {
     if (poke_list(*this, m, v, index)) return true;
-    if (same_name(m, "Style")) return no_index(index), Style(to_int16(v)), true;
-    if (same_name(m, "Sorted")) return no_index(index), Sorted(to_bool(v)), true;
+    if (same_name(m, "Style")) { Style(to_int16(v)); return true; }
+    if (same_name(m, "Sorted")) { Sorted(to_bool(v)); return true; }
     return EditFieldImpl::poke_member(m, v, index);
 }
 

@@ -148,12 +148,12 @@ void MiniMaskedEdit::list_members(std::vector<std::string>& m) const {
 }
 
 std::optional<Variant> MiniMaskedEdit::peek_member(std::string_view m, std::optional<int32_t> index) const {
-    if (same_name(m, "Mask")) return no_index(index), Variant(mask_);
+    if (same_name(m, "Mask")) return Variant(mask_);
     return EditFieldImpl::peek_member(m, index);
 }
 
 bool MiniMaskedEdit::poke_member(std::string_view m, const Variant& v, std::optional<int32_t> index) {
-    if (same_name(m, "Mask")) return no_index(index), Mask(text_of(v)), true;
+    if (same_name(m, "Mask")) { Mask(text_of(v)); return true; }
     return EditFieldImpl::poke_member(m, v, index);
 }
 

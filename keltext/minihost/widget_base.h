@@ -104,12 +104,16 @@ public:
         list_members(m);
         return m;
     }
+    // An unknown member is error 438; an index given to a plain member, or missing for an
+    // indexed one (List, ItemData), is 381. The members below see a checked index.
     Variant peek(std::string_view member, std::optional<int32_t> index = std::nullopt) const override {
+        check_member(member, index);
         auto v = peek_member(member, index);
         if (!v) raise_error(kNoSuchMember);
         return *v;
     }
     void poke(std::string_view member, const Variant& value, std::optional<int32_t> index = std::nullopt) override {
+        check_member(member, index);
         if (!poke_member(member, value, index)) raise_error(kNoSuchMember);
     }
 
@@ -121,27 +125,33 @@ public:
     }
 
 protected:
+    void check_member(std::string_view member, const std::optional<int32_t>& index) const {
+        if (!find_member(*this, member)) raise_error(kNoSuchMember);
+        const bool indexed = same_name(member, "List") || same_name(member, "ItemData");
+        if (indexed != index.has_value()) raise_error(kInvalidPropertyIndex);
+    }
+
     virtual void list_members(std::vector<std::string>& m) const {
         m.insert(m.end(), {"hWnd", "Enabled", "Visible", "Left", "Top", "Width", "Height"});
     }
-    virtual std::optional<Variant> peek_member(std::string_view m, std::optional<int32_t> index) const {
-        if (same_name(m, "hWnd")) return no_index(index), Variant(handle_);
-        if (same_name(m, "Enabled")) return no_index(index), Variant(enabled_);
-        if (same_name(m, "Visible")) return no_index(index), Variant(visible_);
-        if (same_name(m, "Left")) return no_index(index), Variant(left_);
-        if (same_name(m, "Top")) return no_index(index), Variant(top_);
-        if (same_name(m, "Width")) return no_index(index), Variant(width_);
-        if (same_name(m, "Height")) return no_index(index), Variant(height_);
+    virtual std::optional<Variant> peek_member(std::string_view m, std::optional<int32_t> /*index*/) const {
+        if (same_name(m, "hWnd")) return Variant(handle_);
+        if (same_name(m, "Enabled")) return Variant(enabled_);
+        if (same_name(m, "Visible")) return Variant(visible_);
+        if (same_name(m, "Left")) return Variant(left_);
+        if (same_name(m, "Top")) return Variant(top_);
+        if (same_name(m, "Width")) return Variant(width_);
+        if (same_name(m, "Height")) return Variant(height_);
         return std::nullopt;
     }
-    virtual bool poke_member(std::string_view m, const Variant& v, std::optional<int32_t> index) {
+    virtual bool poke_member(std::string_view m, const Variant& v, std::optional<int32_t> /*index*/) {
         if (same_name(m, "hWnd")) read_only_member();
-        if (same_name(m, "Enabled")) return no_index(index), Enabled(to_bool(v)), true;
-        if (same_name(m, "Visible")) return no_index(index), Visible(to_bool(v)), true;
-        if (same_name(m, "Left")) return no_index(index), Left(to_single(v)), true;
-        if (same_name(m, "Top")) return no_index(index), Top(to_single(v)), true;
-        if (same_name(m, "Width")) return no_index(index), Width(to_single(v)), true;
-        if (same_name(m, "Height")) return no_index(index), Height(to_single(v)), true;
+        if (same_name(m, "Enabled")) { Enabled(to_bool(v)); return true; }
+        if (same_name(m, "Visible")) { Visible(to_bool(v)); return true; }
+        if (same_name(m, "Left")) { Left(to_single(v)); return true; }
+        if (same_name(m, "Top")) { Top(to_single(v)); return true; }
+        if (same_name(m, "Width")) { Width(to_single(v)); return true; }
+        if (same_name(m, "Height")) { Height(to_single(v)); return true; }
         return false;
     }
 
@@ -225,16 +235,15 @@ protected:
         m.insert(m.end(), {"ForeColor", "BackColor", "Font"});
     }
     std::optional<Variant> peek_member(std::string_view m, std::optional<int32_t> index) const override {
-        if (same_name(m, "ForeColor")) return no_index(index), Variant(fore_);
-        if (same_name(m, "BackColor")) return no_index(index), Variant(back_);
-        if (same_name(m, "Font")) return no_index(index), Variant(font_);
+        if (same_name(m, "ForeColor")) return Variant(fore_);
+        if (same_name(m, "BackColor")) return Variant(back_);
+        if (same_name(m, "Font")) return Variant(font_);
         return Base::peek_member(m, index);
     }
     bool poke_member(std::string_view m, const Variant& v, std::optional<int32_t> index) override {
-        if (same_name(m, "ForeColor")) return no_index(index), ForeColor(to_int32(v)), true;
-        if (same_name(m, "BackColor")) return no_index(index), BackColor(to_int32(v)), true;
+        if (same_name(m, "ForeColor")) { ForeColor(to_int32(v)); return true; }
+        if (same_name(m, "BackColor")) { BackColor(to_int32(v)); return true; }
         if (same_name(m, "Font")) {
-            no_index(index);
             auto f = font_of(v);
             if (!f) raise_error(kTypeMismatch);
             Font(std::move(f));

@@ -164,6 +164,22 @@ TEST(EditBox, PeekKinds) {
     EXPECT_EQ(*find_member(box, "selstart"), "SelStart");
     EXPECT_EQ(*find_notification(box, "keypress"), "KeyPress");
     EXPECT_FALSE(find_notification(box, "DropDown").has_value());
+
+    // An unknown member is 438 before anything else; an index on a plain member is 381.
+    const struct {
+        const char* member;
+        std::optional<int32_t> index;
+        int error;
+    } bad[] = {{"Text", 0, 381}, {"Bogus", 0, 438}, {"Bogus", std::nullopt, 438}, {"List", 0, 438}};
+    for (const auto& b : bad) {
+        SCOPED_TRACE(b.member);
+        try {
+            (void)box.peek(b.member, b.index);
+            ADD_FAILURE() << "no error";
+        } catch (const RuntimeError& e) {
+            EXPECT_EQ(e.number(), b.error);
+        }
+    }
 }
 
 TEST(EditBox, HandlerErrorsAreReportedAndTheBoxGoesOn) {
