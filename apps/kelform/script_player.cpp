@@ -11,10 +11,6 @@
 namespace kel::kelform {
 namespace {
 
-// Handlers that set properties can raise the events that run them again; past this depth the
-// script is stopped instead of the stack.
-constexpr int kMaxHandlerDepth = 64;
-
 std::string lower_case_ascii(std::string_view s) {
     std::string out(s);
     for (char& c : out)
@@ -195,17 +191,13 @@ void Player::run_line(std::string_view line) {
     std::vector<std::string_view> words = split_words(line);
     if (words.empty()) return;
     Args args(std::vector<std::string_view>(words.begin() + 1, words.end()));
-    deferred_error_.reset();
     try {
         run_command(words[0], args);
-        if (!deferred_error_) {
-            mini::HostedControl* f = form_->focused();
-            guarded(f ? std::string_view(f->name()) : std::string_view("form"), [this] { form_->run_pending(); });
-        }
+        mini::HostedControl* f = form_->focused();
+        guarded(f ? std::string_view(f->name()) : std::string_view("form"), [this] { form_->run_pending(); });
     } catch (const mini::FormError& e) {
         throw ScriptError(e.what());
     }
-    if (deferred_error_) throw ScriptError(*deferred_error_);
 }
 
 void Player::run_command(std::string_view word, Args& args) {
@@ -309,13 +301,10 @@ void Player::event_raised(mini::HostedControl& control, int /*number*/, std::str
         for (const EventArg& a : args) out_ << ' ' << a.name << '=' << format_plain(a.value);
         out_ << '\n';
     }
-    if (handler_depth_ >= kMaxHandlerDepth) {
-        if (!deferred_error_)
-            deferred_error_ = "event handlers nested too deep at " + control.name() + "." + std::string(event);
-        return;
-    }
-    // Handlers may add or remove handlers only from script lines, never while one runs, but
-    // copying keeps this loop safe whatever the form does meanwhile.
+    // Handlers that set properties can raise the events that run them again: the form stops
+    // such a chain with error 28 (out of stack space), as the host would. Handlers are added
+    // and removed only by script lines, but running a copy keeps this loop safe whatever the
+    // form does meanwhile.
     std::vector<const Handler*> matching;
     for (const Handler& h : handlers_)
         if (h.control == &control && same_name(h.event, event)) matching.push_back(&h);
@@ -323,9 +312,7 @@ void Player::event_raised(mini::HostedControl& control, int /*number*/, std::str
     std::vector<Handler> running;
     running.reserve(matching.size());
     for (const Handler* h : matching) running.push_back(*h);
-    ++handler_depth_;
     for (const Handler& h : running) run_handler(h, args);
-    --handler_depth_;
 }
 
 void Player::run_handler(const Handler& h, std::span<EventArg> args) {
@@ -507,7 +494,6 @@ void Player::cmd_type(Args& a) {
     a.finish();
     for (char ch : text) {
         keystroke(mini::keystroke_for_char(static_cast<uint8_t>(ch)));
-        if (deferred_error_) return;
     }
 }
 

@@ -139,8 +139,6 @@ private:
     bool trace_changed_ = false;
     bool expect_failed_ = false;
     bool refusal_reported_ = false;
-    int handler_depth_ = 0;
-    std::optional<std::string> deferred_error_;  // a script error found inside a notification
     std::string file_;
     std::size_t line_ = 0;
     std::unique_ptr<mini::Form> form_;  // last: destroyed first, while the rest is still whole

@@ -64,7 +64,9 @@ TEST(ScriptRobustness, RandomScriptsEndWithAStatus) {
         int status = -1;
         EXPECT_NO_THROW(status = whole.run_script(text, "r.kfs", err)) << text;
         EXPECT_TRUE(status >= 0 && status <= 2) << text;
-        if (status == 2) EXPECT_EQ(err.str().rfind("r.kfs:", 0), 0u) << err.str();
+        if (status == 2) {
+            EXPECT_EQ(err.str().rfind("r.kfs:", 0), 0u) << err.str();
+        }
 
         // Line by line on one form, going on past script errors, so that later lines meet
         // the state earlier ones left.
