@@ -27,7 +27,8 @@ bool same_value(const Variant& a, const Variant& b) {
     return a == b;
 }
 
-// Whole-number arguments of commands (positions, buttons, codes): a numeric literal in range.
+// Numeric arguments of commands (sizes, positions, buttons, codes): a numeric literal, checked
+// against the range of what it feeds.
 double number_arg(Args& a, std::string_view what) {
     std::string_view word = a.next(what);
     Variant v = parse_value(word);
