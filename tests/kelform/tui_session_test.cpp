@@ -261,6 +261,47 @@ TEST_F(SessionTest, TinyAndHugeScreensDrawWithoutHarm) {
     EXPECT_FALSE(session->list_open());
 }
 
+TEST(SessionForms, LockedFieldsAreGreyAndTakeNoFocusOrClicks) {
+    Catalogue catalogue;
+    const FormSpec spec = parse_form(
+        "form \"F\"\n"
+        "control KelAlphaNumeric A\n label \"First\"\n at 2 10\n size 1210 300\nend\n"
+        "control KelAlphaNumeric B\n label \"Locked\"\n at 4 10\n size 1210 300\n store Locked true\n"
+        " store Text \"kept\"\nend\n",
+        "f.kform", catalogue.classes());
+    mini::Form form;
+    open_form(form, spec, catalogue.classes(), "f.kform", make_date(2026, 1, 1).value());
+    TerminalSession session(form, spec, make_date(2026, 1, 1).value());
+    Canvas c(24, 80);
+    session.render(c);
+    EXPECT_EQ(c.row_text(4), "  Locked kept");
+    EXPECT_TRUE(c.at(4, 9).style.dim);
+    EXPECT_EQ(c.at(4, 9).style.fg, kGreyText);
+    EXPECT_FALSE(c.at(2, 9).style.dim);
+    session.handle(Input::click_at(4, 10));
+    session.handle(Input::key_of(mini::kVkTab));
+    EXPECT_EQ(form.focused()->name(), "A");
+    session.handle(Input::char_of(U'z'));
+    EXPECT_EQ(form.find("B")->dispatch().get("Text"), Variant("kept"));
+}
+
+TEST(SessionForms, AnEmptyFormStillRunsAndFinishes) {
+    Catalogue catalogue;
+    const FormSpec spec = parse_form("form \"Nothing\"\n", "e.kform", catalogue.classes());
+    mini::Form form;
+    TerminalSession session(form, spec, make_date(2026, 1, 1).value());
+    for (int16_t k : {int16_t{mini::kVkTab}, int16_t{mini::kVkDown}, kF4, int16_t{mini::kVkInsert}})
+        EXPECT_EQ(session.handle(Input::key_of(k)), TerminalSession::Outcome::going_on);
+    session.handle(Input::char_of(U'x'));
+    session.handle(Input::click_at(3, 3));
+    Canvas c(24, 80);
+    session.render(c);
+    EXPECT_TRUE(c.row_text(0).starts_with(" Nothing "));
+    EXPECT_TRUE(c.row_text(0).ends_with(" kelform"));
+    EXPECT_EQ(session.handle(Input::key_of(kF10)), TerminalSession::Outcome::finished);
+    EXPECT_EQ(session.values_json(), "{}");
+}
+
 TEST(JsonString, EscapesAndConvertsToUtf8) {
     EXPECT_EQ(json_string("a\"b\\c\n\x01\xE9\x80"), "\"a\\\"b\\\\c\\n\\u0001\u00e9\u20ac\"");
 }
