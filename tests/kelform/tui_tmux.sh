@@ -5,6 +5,7 @@
 # usage: tui_tmux.sh KELFORM VOUCHER.kform
 # Exit 77 (skipped) when tmux is missing.
 set -euo pipefail
+export LC_ALL=C.UTF-8
 
 kelform=$1
 voucher=$2
@@ -61,6 +62,24 @@ expect_line() {
 }
 
 send() { tm send-keys -t kf "$@"; sleep 0.15; }
+
+# A mouse click (press and release, in the terminal's basic mouse report) on the first cell
+# that shows CHAR on the line of LABEL.
+click_on() {
+  local label=$1 char=$2 line row prefix col
+  row=$(screen | grep -nF -- "$label" | head -n 1 | cut -d: -f1)
+  [ -n "$row" ] || fail "no line shows '$label'"
+  row=$((row - 1))
+  line=$(line_of "$label")
+  case $line in *"$char"*) ;; *) fail "the line of '$label' shows no '$char'" ;; esac
+  prefix=${line%%"$char"*}
+  col=${#prefix}
+  local x y
+  x=$(printf '\\x%x' $((33 + col)))
+  y=$(printf '\\x%x' $((33 + row)))
+  tm send-keys -t kf -l "$(printf "\\e[M $x$y\\e[M#$x$y")"
+  sleep 0.15
+}
 
 wait_exit() {
   for _ in $(seq 1 100); do
@@ -130,6 +149,9 @@ cp "$voucher" "$work/v.kform"
 start run v.kform
 wait_for "Payment voucher"
 send -l "anil"
+click_on "Amount (Rs)" "▲"                         # the spin buttons, by mouse
+click_on "Amount (Rs)" "▲"
+expect_line "Amount (Rs)" "101"                   # empty: the lower bound 1, then 100 up
 send Tab Tab Tab Tab
 send F4                                           # the combo's list
 wait_for "UPI"
@@ -145,6 +167,7 @@ send F10
 status=$(wait_exit)
 [ "$status" = 0 ] || fail "exit status $status after F10 on a form file"
 grep -qF '"Payee": "Anil"' "$work/out" || fail "payee not printed: $(cat "$work/out")"
+grep -qF '"Amount": 101,' "$work/out" || fail "spin buttons not applied: $(cat "$work/out")"
 grep -qF "\"VoucherDate\": \"$day1\"" "$work/out" || fail "calendar day not printed: $(cat "$work/out")"
 grep -qF 'store Text "Anil"' "$work/v.kform" || fail "the form file was not saved with the payee"
 
