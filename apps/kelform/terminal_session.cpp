@@ -19,6 +19,10 @@ using mini::HostedControl;
 using mini::Keystroke;
 using mini::Part;
 
+constexpr int16_t kVkF2 = mini::kVkF1 + 1;
+constexpr int16_t kVkF4 = mini::kVkF1 + 3;
+constexpr int16_t kVkF10 = mini::kVkF1 + 9;
+
 constexpr float kTwipsPerCell = 120;  // a Fixedsys character cell, as the controls size themselves
 constexpr std::size_t kMaxEvents = 500;
 constexpr int kCalendarHeight = 10;
@@ -259,22 +263,22 @@ TerminalSession::Outcome TerminalSession::handle_key(int16_t key, int16_t shift)
         if (list_key(key, shift)) return Outcome::going_on;
         list_.reset();
     }
-    if (key == mini::kVkF1 + 9 || (ctrl && key == 'S')) {  // F10
+    if (key == kVkF10 || (ctrl && key == 'S')) {
         return finish_focus() ? Outcome::finished : Outcome::going_on;
     }
     if ((key == mini::kVkEscape && shift == 0) || (ctrl && key == 'Q')) return Outcome::quit;
-    if (key == mini::kVkF1 + 1) {  // F2
+    if (key == kVkF2) {
         events_shown_ = !events_shown_;
         return Outcome::going_on;
     }
     HostedControl* focused = form_.focused();
     if (key == mini::kVkTab && !ctrl && !alt) {
         if (focused) form_.tab((shift & mini::kShiftMask) == 0);
-        else if (auto all = form_.controls(); !all.empty()) form_.tab(true);
+        else form_.tab(true);
         return Outcome::going_on;
     }
     if (!focused) return Outcome::going_on;
-    const bool f4 = key == mini::kVkF1 + 3 && shift == 0;
+    const bool f4 = key == kVkF4 && shift == 0;
     if (f4 || (alt && (key == mini::kVkDown || key == mini::kVkUp))) {
         if (is_class(*focused, "KelCombo") && (f4 || key == mini::kVkDown)) {
             open_list(*focused);
@@ -383,7 +387,7 @@ bool TerminalSession::list_key(int16_t key, int16_t shift) {
         case mini::kVkTab: pick_list_entry(h); return false;  // picks, then Tab moves on
         default: break;
     }
-    if (key == mini::kVkF1 + 3 || (alt && (key == mini::kVkUp || key == mini::kVkDown))) {
+    if (key == kVkF4 || (alt && (key == mini::kVkUp || key == mini::kVkDown))) {
         pick_list_entry(h);
         return true;
     }
@@ -462,7 +466,7 @@ bool TerminalSession::calendar_key(int16_t key, int16_t shift) {
 // ---- clicks --------------------------------------------------------------------------------
 
 void TerminalSession::handle_click(int row, int col) {
-    if (last_layout_.empty()) last_layout_ = layout(rows_, cols_);
+    if (last_layout_.empty()) last_layout_ = layout();
     if (calendar_) {
         for (const Layout& l : last_layout_)
             if (l.control->name() == calendar_->control) {
@@ -561,9 +565,7 @@ void TerminalSession::calendar_click(int row, int col) {
 
 // ---- drawing -------------------------------------------------------------------------------
 
-std::vector<TerminalSession::Layout> TerminalSession::layout(int rows, int cols) {
-    (void)rows;
-    (void)cols;
+std::vector<TerminalSession::Layout> TerminalSession::layout() {
     std::vector<Layout> out;
     for (const ControlSpec& spec : spec_.controls) {
         HostedControl* c = form_.find(spec.name);
@@ -760,7 +762,7 @@ void TerminalSession::render(Canvas& canvas) {
                 if (c.row - top_ < 1) top_ = c.row - 1;
             }
     top_ = std::max(top_, 0);
-    last_layout_ = layout(rows_, cols_);
+    last_layout_ = layout();
 
     for (const Layout& l : last_layout_) draw_control(canvas, l, l.control == focused);
 

@@ -108,7 +108,7 @@ private:
     void keep_failed_date(mini::HostedControl* left);
     bool finish_focus();
 
-    std::vector<Layout> layout(int rows, int cols);
+    std::vector<Layout> layout();
     Rect calendar_rect(const Layout& box, int rows, int cols) const;
     Rect list_rect(const Layout& box, int rows) const;
     void draw_control(Canvas& canvas, const Layout& l, bool focused);
