@@ -15,10 +15,16 @@ if ! command -v tmux >/dev/null 2>&1; then
 fi
 
 work=$(mktemp -d)
-sock=$work/tmux.sock
+sock=$work/tmux.0.sock
+runs=0
 unset TMUX
 tm() { tmux -S "$sock" -f /dev/null "$@"; }
-cleanup() { tm kill-server >/dev/null 2>&1 || true; rm -rf "$work"; }
+cleanup() {
+  for s in "$work"/tmux.*.sock; do
+    [ -S "$s" ] && tmux -S "$s" kill-server >/dev/null 2>&1 || true
+  done
+  rm -rf "$work"
+}
 trap cleanup EXIT
 
 fail() {
@@ -33,7 +39,10 @@ fail() {
 # to $work/out, its exit status to $work/status.
 start() {
   rm -f "$work/out" "$work/status"
+  # Each run gets a server of its own: a server being killed cannot take the next one along.
   tm kill-server >/dev/null 2>&1 || true
+  runs=$((runs + 1))
+  sock=$work/tmux.$runs.sock
   tm new-session -d -s kf -x 80 -y 24 \
     "cd '$work' && LANG=C.UTF-8 LC_ALL=C.UTF-8 '$kelform' $* > '$work/out'; echo \$? > '$work/status'; sleep 60"
 }
@@ -42,7 +51,7 @@ screen() { tm capture-pane -p -t kf; }
 
 wait_for() {
   local text=$1
-  for _ in $(seq 1 100); do
+  for _ in $(seq 1 300); do
     if screen | grep -qF -- "$text"; then return 0; fi
     sleep 0.1
   done
@@ -54,7 +63,7 @@ line_of() { screen | grep -F -- "$1" | head -n 1; }
 
 expect_line() {
   local label=$1 text=$2
-  for _ in $(seq 1 50); do
+  for _ in $(seq 1 200); do
     if line_of "$label" | grep -qF -- "$text"; then return 0; fi
     sleep 0.1
   done
@@ -82,7 +91,7 @@ click_on() {
 }
 
 wait_exit() {
-  for _ in $(seq 1 100); do
+  for _ in $(seq 1 300); do
     if [ -s "$work/status" ]; then cat "$work/status"; return 0; fi
     sleep 0.1
   done
