@@ -24,7 +24,7 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
     const auto classes = std::span<const kel::ClassInfo>(catalogue.classes());
     const std::string_view text(reinterpret_cast<const char*>(data), size);
 
-    FormSpec spec;
+    SavedForm spec;
     try {
         spec = parse_form(text, kFile, classes);
     } catch (const FormFileError& e) {
@@ -34,7 +34,7 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
 
     // Written and read again: the same form, so the same text.
     const std::string written = write_form(spec);
-    FormSpec again;
+    SavedForm again;
     try {
         again = parse_form(written, kFile, classes);
     } catch (const FormFileError& e) {
@@ -51,7 +51,7 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
         KEL_FUZZ_CHECK(e.file() == kFile);
         return 0;
     }
-    const FormSpec captured = capture_form(form, spec);
+    const SavedForm captured = capture_form(form, spec);
     const std::string saved = write_form(captured);
     try {
         KEL_FUZZ_CHECK(write_form(parse_form(saved, kFile, classes)) == saved);
