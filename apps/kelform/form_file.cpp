@@ -61,7 +61,7 @@ class Parser {
 public:
     Parser(const std::string& file, std::span<const ClassInfo> classes) : file_(file), classes_(classes) {}
 
-    FormSpec parse(std::string_view text) {
+    SavedForm parse(std::string_view text) {
         int line_no = 0;
         std::size_t pos = 0;
         while (pos <= text.size()) {
@@ -75,8 +75,8 @@ public:
         }
         if (current_) fail(current_->line, "control '" + current_->name + "' has no 'end'");
         if (!have_form_) fail(line_no, "the file has no 'form' line");
-        spec_.trailing_comments = std::move(pending_comments_);
-        return std::move(spec_);
+        saved_.trailing_comments = std::move(pending_comments_);
+        return std::move(saved_);
     }
 
 private:
@@ -135,8 +135,8 @@ private:
         if (have_form_) fail(line_no, "a second 'form' line");
         if (current_) fail(line_no, "'form' inside control '" + current_->name + "'");
         if (args.size() != 1) fail(line_no, "'form' takes the form's title as one quoted string");
-        spec_.title = string_arg(args[0], line_no, "the title");
-        spec_.comments = std::move(pending_comments_);
+        saved_.title = string_arg(args[0], line_no, "the title");
+        saved_.comments = std::move(pending_comments_);
         pending_comments_.clear();
         have_form_ = true;
     }
@@ -151,7 +151,7 @@ private:
         if (cls->is_page) fail(line_no, "'" + cls->name + "' is a property page, not a control");
         const std::string name(args[1]);
         if (!is_name(name)) fail(line_no, "'" + shown(name) + "' is not a name (letters, digits and _)");
-        for (const ControlSpec& c : spec_.controls)
+        for (const SavedControl& c : saved_.controls)
             if (same_name(c.name, name))
                 fail(line_no, "a control named '" + c.name + "' is already on the form (line " +
                                   std::to_string(c.line) + ")");
@@ -171,7 +171,7 @@ private:
         // Comments inside the block are written back before it.
         for (auto& c : pending_comments_) current_->comments.push_back(std::move(c));
         pending_comments_.clear();
-        spec_.controls.push_back(std::move(*current_));
+        saved_.controls.push_back(std::move(*current_));
         current_.reset();
         current_class_ = nullptr;
     }
@@ -231,10 +231,10 @@ private:
 
     const std::string& file_;
     std::span<const ClassInfo> classes_;
-    FormSpec spec_;
+    SavedForm saved_;
     bool have_form_ = false;
     bool seen_at_ = false;
-    std::optional<ControlSpec> current_;
+    std::optional<SavedControl> current_;
     const ClassInfo* current_class_ = nullptr;
     std::vector<std::string> pending_comments_;
 };
@@ -332,11 +332,11 @@ std::string value_literal(const Variant& v, std::string_view key) {
     return "empty";
 }
 
-FormSpec parse_form(std::string_view text, const std::string& file, std::span<const ClassInfo> classes) {
+SavedForm parse_form(std::string_view text, const std::string& file, std::span<const ClassInfo> classes) {
     return Parser(file, classes).parse(text);
 }
 
-FormSpec read_form_file(const std::string& path, std::span<const ClassInfo> classes) {
+SavedForm read_form_file(const std::string& path, std::span<const ClassInfo> classes) {
     std::ifstream in(path, std::ios::binary);
     if (!in) throw FormFileError(path, 0, "cannot open the file");
     std::ostringstream text;
@@ -345,11 +345,11 @@ FormSpec read_form_file(const std::string& path, std::span<const ClassInfo> clas
     return parse_form(text.str(), path, classes);
 }
 
-std::string write_form(const FormSpec& form) {
+std::string write_form(const SavedForm& form) {
     std::string out;
     for (const auto& c : form.comments) out += c + "\n";
     out += "form " + string_literal(form.title) + "\n";
-    for (const ControlSpec& c : form.controls) {
+    for (const SavedControl& c : form.controls) {
         out += "\n";
         for (const auto& note : c.comments) out += note + "\n";
         out += "control " + c.class_name + " " + c.name + "\n";
@@ -372,7 +372,7 @@ std::string write_form(const FormSpec& form) {
     return out;
 }
 
-void write_form_file(const std::string& path, const FormSpec& form) {
+void write_form_file(const std::string& path, const SavedForm& form) {
     const std::string text = write_form(form);
     const std::string temp = path + ".saving";
     {
@@ -410,9 +410,9 @@ Variant setting_value(std::string_view literal, Date today) {
     return parse_value(literal);
 }
 
-void open_form(mini::Form& form, const FormSpec& spec, std::span<const ClassInfo> classes, const std::string& file,
+void open_form(mini::Form& form, const SavedForm& saved, std::span<const ClassInfo> classes, const std::string& file,
                Date today) {
-    for (const ControlSpec& c : spec.controls) {
+    for (const SavedControl& c : saved.controls) {
         const ClassInfo* cls = find_class(classes, c.class_name);
         if (!cls) throw FormFileError(file, c.line, "unknown class '" + c.class_name + "'");
         try {
@@ -427,7 +427,7 @@ void open_form(mini::Form& form, const FormSpec& spec, std::span<const ClassInfo
             throw FormFileError(file, c.line, e.what());
         }
     }
-    for (const ControlSpec& c : spec.controls) {
+    for (const SavedControl& c : saved.controls) {
         mini::HostedControl* hosted = form.find(c.name);
         if (!hosted) continue;
         for (const OpenSetting& s : c.settings) {
@@ -447,15 +447,15 @@ void open_form(mini::Form& form, const FormSpec& spec, std::span<const ClassInfo
     }
 }
 
-FormSpec capture_form(mini::Form& form, const FormSpec& spec) {
-    FormSpec out = spec;
+SavedForm capture_form(mini::Form& form, const SavedForm& saved) {
+    SavedForm out = saved;
     int next_row = 1;
-    for (const ControlSpec& c : out.controls) next_row = std::max(next_row, c.row + 2);
+    for (const SavedControl& c : out.controls) next_row = std::max(next_row, c.row + 2);
     for (mini::HostedControl* hosted : form.controls()) {
         auto it = std::find_if(out.controls.begin(), out.controls.end(),
-                               [&](const ControlSpec& c) { return same_name(c.name, hosted->name()); });
+                               [&](const SavedControl& c) { return same_name(c.name, hosted->name()); });
         if (it == out.controls.end()) {
-            ControlSpec added;
+            SavedControl added;
             added.class_name = hosted->info().name;
             added.name = hosted->name();
             added.label = hosted->name();
@@ -481,32 +481,32 @@ Date local_today() {
 }
 
 void add_form_commands(Player& player, std::span<const ClassInfo> classes) {
-    // The spec the script's form was loaded from, shared by the two commands of this player.
-    auto spec = std::make_shared<FormSpec>();
-    spec->title = "Form";
+    // The form file the script's form was loaded from, shared by the two commands of this player.
+    auto saved = std::make_shared<SavedForm>();
+    saved->title = "Form";
     const auto file_arg = [](Args& a) {
         const std::string_view word = a.next("FILE");
         a.finish();
         return is_string_literal(word) ? decode_string(word) : std::string(word);
     };
-    player.add_command("loadform", [spec, classes, file_arg](Player& p, Args& a) {
+    player.add_command("loadform", [saved, classes, file_arg](Player& p, Args& a) {
         const std::string file = file_arg(a);
         try {
-            FormSpec loaded = read_form_file(file, classes);
+            SavedForm loaded = read_form_file(file, classes);
             open_form(p.form(), loaded, classes, file, local_today());
-            if (spec->controls.empty()) {
-                *spec = std::move(loaded);
+            if (saved->controls.empty()) {
+                *saved = std::move(loaded);
             } else {
-                for (auto& c : loaded.controls) spec->controls.push_back(std::move(c));
+                for (auto& c : loaded.controls) saved->controls.push_back(std::move(c));
             }
         } catch (const FormFileError& e) {
             throw ScriptError(e.what());
         }
     });
-    player.add_command("saveform", [spec, file_arg](Player& p, Args& a) {
+    player.add_command("saveform", [saved, file_arg](Player& p, Args& a) {
         const std::string file = file_arg(a);
         try {
-            write_form_file(file, capture_form(p.form(), *spec));
+            write_form_file(file, capture_form(p.form(), *saved));
         } catch (const FormFileError& e) {
             throw ScriptError(e.what());
         }

@@ -42,7 +42,7 @@ struct OpenSetting {
     int line = 0;
 };
 
-struct ControlSpec {
+struct SavedControl {
     std::string class_name;  // the library's own spelling
     std::string name;
     std::string label;
@@ -61,23 +61,23 @@ struct ControlSpec {
     int line = 0;                       // the `control` line
 };
 
-struct FormSpec {
+struct SavedForm {
     std::string title;
     std::vector<std::string> comments;  // comment lines before `form`
-    std::vector<ControlSpec> controls;  // tab order
+    std::vector<SavedControl> controls;  // tab order
     std::vector<std::string> trailing_comments;
 };
 
 // Parses a form file. `file` names it in error messages. Class names are checked against the
 // classes given (property pages cannot stand on a form), and so are the properties of `set`.
-FormSpec parse_form(std::string_view text, const std::string& file, std::span<const ClassInfo> classes);
+SavedForm parse_form(std::string_view text, const std::string& file, std::span<const ClassInfo> classes);
 // Reads and parses a file (FormFileError with line 0 when it cannot be read).
-FormSpec read_form_file(const std::string& path, std::span<const ClassInfo> classes);
+SavedForm read_form_file(const std::string& path, std::span<const ClassInfo> classes);
 
 // The text of a form file; parse_form of it gives the same form back.
-std::string write_form(const FormSpec& form);
+std::string write_form(const SavedForm& form);
 // Writes the file whole or not at all (through a temporary file beside it).
-void write_form_file(const std::string& path, const FormSpec& form);
+void write_form_file(const std::string& path, const SavedForm& form);
 
 // Value literals as form files and scripts write them: a literal that reads back as the same
 // kind and value. `key` only chooses the hex form for colours.
@@ -93,21 +93,21 @@ Variant setting_value(std::string_view literal, Date today);
 Date financial_year_start(Date day);
 Date financial_year_end(Date day);
 
-// Loads every control of the spec onto the form (in order, so tab order is file order) with
+// Loads every control of the saved form onto the form (in order, so tab order is file order) with
 // the stored values, then makes the opening settings. Errors name the file and line.
-void open_form(mini::Form& form, const FormSpec& spec, std::span<const ClassInfo> classes, const std::string& file,
+void open_form(mini::Form& form, const SavedForm& saved, std::span<const ClassInfo> classes, const std::string& file,
                Date today);
 
 // Today's date on this machine's clock, in local time.
 Date local_today();
 
-// The spec with each control's stored values replaced by what WriteProperties stores now.
-// Controls on the form that the spec does not hold are added below the others, with their
+// The saved form with each control's stored values replaced by what WriteProperties stores now.
+// Controls on the form that the saved form does not hold are added below the others, with their
 // name as the label and their present size.
-FormSpec capture_form(mini::Form& form, const FormSpec& spec);
+SavedForm capture_form(mini::Form& form, const SavedForm& saved);
 
 class Player;
-// Adds `loadform FILE` and `saveform FILE` to a script player. Both remember the form spec
+// Adds `loadform FILE` and `saveform FILE` to a script player. Both remember the form file
 // between them, so that a form loaded and saved again keeps its title, labels and places.
 void add_form_commands(Player& player, std::span<const ClassInfo> classes);
 

@@ -36,12 +36,12 @@ int run_terminal(int argc, char** argv) {
     Catalogue catalogue;
     const std::string name = path ? *path : std::string(kDemoFormName);
     const Date today = local_today();
-    FormSpec spec;
+    SavedForm saved;
     mini::Form form;
     try {
-        spec = path ? read_form_file(*path, catalogue.classes())
+        saved = path ? read_form_file(*path, catalogue.classes())
                     : parse_form(demo_form_text(), name, catalogue.classes());
-        open_form(form, spec, catalogue.classes(), name, today);
+        open_form(form, saved, catalogue.classes(), name, today);
     } catch (const FormFileError& e) {
         std::cerr << e.what() << '\n';
         return 2;
@@ -53,7 +53,7 @@ int run_terminal(int argc, char** argv) {
         return 2;
     }
 
-    TerminalSession session(form, spec, today);
+    TerminalSession session(form, saved, today);
     std::string error;
     const auto outcome = run_tui(session, error);
     if (!outcome) {
@@ -66,7 +66,7 @@ int run_terminal(int argc, char** argv) {
     std::cout.flush();
     if (path) {
         try {
-            write_form_file(*path, capture_form(form, spec));
+            write_form_file(*path, capture_form(form, saved));
         } catch (const FormFileError& e) {
             std::cerr << e.what() << '\n';
             return 2;

@@ -131,8 +131,8 @@ std::string json_string(std::string_view cp1252) {
     return out + "\"";
 }
 
-TerminalSession::TerminalSession(mini::Form& form, const FormSpec& spec, Date today)
-    : form_(form), spec_(spec), today_(today) {
+TerminalSession::TerminalSession(mini::Form& form, const SavedForm& saved, Date today)
+    : form_(form), saved_(saved), today_(today) {
     form_.set_observer(this);
     for (HostedControl* c : form_.controls())
         if (c->can_take_focus()) {
@@ -146,7 +146,7 @@ TerminalSession::~TerminalSession() { form_.set_observer(nullptr); }
 // ---- the form's own code -------------------------------------------------------------------
 
 std::string TerminalSession::label_of(const HostedControl& control) const {
-    for (const ControlSpec& c : spec_.controls)
+    for (const SavedControl& c : saved_.controls)
         if (same_name(c.name, control.name()) && !c.label.empty()) {
             // "Amount (Rs)" is "Amount" on the status line.
             const auto paren = c.label.find(" (");
@@ -567,14 +567,14 @@ void TerminalSession::calendar_click(int row, int col) {
 
 std::vector<TerminalSession::Layout> TerminalSession::layout() {
     std::vector<Layout> out;
-    for (const ControlSpec& spec : spec_.controls) {
-        HostedControl* c = form_.find(spec.name);
+    for (const SavedControl& saved : saved_.controls) {
+        HostedControl* c = form_.find(saved.name);
         if (!c) continue;
         Layout l;
         l.control = c;
-        l.spec = &spec;
+        l.saved = &saved;
         Part& surface = c->surface_part();
-        l.field = {spec.row - top_, spec.col - 1, 1, std::max(cells(peek_number(&surface, "Width")), 1)};
+        l.field = {saved.row - top_, saved.col - 1, 1, std::max(cells(peek_number(&surface, "Width")), 1)};
         Part* edit = c->keyboard_part();
         const int edit_left = edit ? cells(peek_number(edit, "Left")) : 0;
         int edit_width = edit ? cells(peek_number(edit, "Width")) : l.field.width;
@@ -589,9 +589,9 @@ std::vector<TerminalSession::Layout> TerminalSession::layout() {
             l.spin_col = l.field.col + cells(peek_number(spin, "Left"));
         if (Part* image = part_of_type(*c, "Image"); image && peek_bool(image, "Visible", false))
             l.image_col = l.field.col + cells(peek_number(image, "Left"));
-        const int label_len = static_cast<int>(spec.label.size());
-        if (spec.label_row && spec.label_col)
-            l.label = {*spec.label_row - top_, *spec.label_col - 1, 1, label_len};
+        const int label_len = static_cast<int>(saved.label.size());
+        if (saved.label_row && saved.label_col)
+            l.label = {*saved.label_row - top_, *saved.label_col - 1, 1, label_len};
         else
             l.label = {l.field.row, std::max(l.field.col - label_len - 1, 0), 1, label_len};
         // The field may be wider than its parts: clicks count on what is drawn.
@@ -636,7 +636,7 @@ void TerminalSession::draw_control(Canvas& canvas, const Layout& l, bool focused
     CellStyle label_style;
     label_style.bold = focused;
     label_style.dim = !enabled;
-    canvas.put_text(l.label.row, l.label.col, l.spec->label, label_style);
+    canvas.put_text(l.label.row, l.label.col, l.saved->label, label_style);
 
     CellStyle style;
     style.fg = peek_colour(field, "ForeColor");
@@ -756,7 +756,7 @@ void TerminalSession::render(Canvas& canvas) {
     const int pane_height = events_shown_ ? std::max((rows_ - 3) / 3, 4) : 0;
     const int last_row = std::max(rows_ - 3 - pane_height, 1);
     if (focused)
-        for (const ControlSpec& c : spec_.controls)
+        for (const SavedControl& c : saved_.controls)
             if (same_name(c.name, focused->name())) {
                 if (c.row - top_ > last_row) top_ = c.row - last_row;
                 if (c.row - top_ < 1) top_ = c.row - 1;
@@ -770,7 +770,7 @@ void TerminalSession::render(Canvas& canvas) {
     CellStyle bar;
     bar.reverse = true;
     canvas.fill(0, 0, 1, cols_, bar);
-    canvas.put_text(0, 1, spec_.title, bar, std::max(cols_ - 12, 0));
+    canvas.put_text(0, 1, saved_.title, bar, std::max(cols_ - 12, 0));
     canvas.put_text(0, std::max(cols_ - 8, 0), "kelform", bar);
 
     if (events_shown_) {

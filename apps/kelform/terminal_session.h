@@ -37,9 +37,9 @@ class TerminalSession : private mini::FormObserver {
 public:
     enum class Outcome { going_on, finished, quit };
 
-    // The form must already hold the spec's controls (open_form); the session becomes its
+    // The form must already hold the saved form's controls (open_form); the session becomes its
     // observer and puts focus in the first control that can take it.
-    TerminalSession(mini::Form& form, const FormSpec& spec, Date today);
+    TerminalSession(mini::Form& form, const SavedForm& saved, Date today);
     ~TerminalSession() override;
     TerminalSession(const TerminalSession&) = delete;
     TerminalSession& operator=(const TerminalSession&) = delete;
@@ -74,7 +74,7 @@ private:
     // Where one control stands on the screen, worked out from its surface and parts.
     struct Layout {
         mini::HostedControl* control = nullptr;
-        const ControlSpec* spec = nullptr;
+        const SavedControl* saved = nullptr;
         Rect field;                    // the whole control
         Rect edit;                     // its edit field
         std::optional<int> spin_col;   // spin buttons (two cells: up, down)
@@ -120,7 +120,7 @@ private:
     void say(std::string message) { status_ = std::move(message); }
 
     mini::Form& form_;
-    const FormSpec& spec_;
+    const SavedForm& saved_;
     Date today_;
     std::string status_;
     std::deque<std::string> events_;

@@ -51,7 +51,7 @@ class FormFileTest : public ::testing::Test {
 protected:
     Catalogue catalogue;
     std::span<const ClassInfo> classes() { return catalogue.classes(); }
-    FormSpec parse(std::string_view text) { return parse_form(text, "t.kform", classes()); }
+    SavedForm parse(std::string_view text) { return parse_form(text, "t.kform", classes()); }
 };
 
 TEST_F(FormFileTest, DemoFormIsTheShippedExample) {
@@ -59,34 +59,34 @@ TEST_F(FormFileTest, DemoFormIsTheShippedExample) {
 }
 
 TEST_F(FormFileTest, DemoFormOpensAndSavesBackUnchanged) {
-    const FormSpec spec = parse(demo_form_text());
-    ASSERT_EQ(spec.controls.size(), 7u);
-    EXPECT_EQ(spec.title, "Payment voucher");
+    const SavedForm saved = parse(demo_form_text());
+    ASSERT_EQ(saved.controls.size(), 7u);
+    EXPECT_EQ(saved.title, "Payment voucher");
     mini::Form form;
-    open_form(form, spec, classes(), "voucher.kform", day(2026, 12, 6));
+    open_form(form, saved, classes(), "voucher.kform", day(2026, 12, 6));
     // What the controls store after reading the file is exactly what the file holds.
-    EXPECT_EQ(write_form(capture_form(form, spec)), std::string(demo_form_text()));
+    EXPECT_EQ(write_form(capture_form(form, saved)), std::string(demo_form_text()));
 }
 
 TEST_F(FormFileTest, SavedValuesComeBackAfterReopening) {
-    const FormSpec spec = parse(demo_form_text());
+    const SavedForm loaded = parse(demo_form_text());
     mini::Form form;
-    open_form(form, spec, classes(), "voucher.kform", day(2026, 12, 6));
+    open_form(form, loaded, classes(), "voucher.kform", day(2026, 12, 6));
     // A person types into the payee box; the alphanumeric box stores its text.
     form.focus(form.find("Payee"));
     for (char c : std::string("jos\xE9 \"q\" \\ x")) form.keystroke(mini::keystroke_for_char(static_cast<uint8_t>(c)));
     form.find("PayMode")->dispatch().set("FillList", Variant("A\xC9" "1\xC8" "B\xC9-7\xC8"));
     const Variant typed = form.find("Payee")->dispatch().get("Text");
     ASSERT_EQ(typed.str().size(), 12u);
-    const FormSpec saved = capture_form(form, spec);
+    const SavedForm saved = capture_form(form, loaded);
     const std::string text = write_form(saved);
 
-    const FormSpec again = parse(text);
+    const SavedForm again = parse(text);
     mini::Form reopened;
     open_form(reopened, again, classes(), "again.kform", day(2026, 12, 6));
     EXPECT_EQ(reopened.find("Payee")->dispatch().get("Text"), typed);
     EXPECT_EQ(reopened.find("PayMode")->dispatch().get("ListCount"), Variant(int16_t{2}));
-    const FormSpec twice = capture_form(reopened, again);
+    const SavedForm twice = capture_form(reopened, again);
     ASSERT_EQ(twice.controls.size(), saved.controls.size());
     for (std::size_t i = 0; i < saved.controls.size(); ++i) {
         EXPECT_EQ(twice.controls[i].stored.size(), saved.controls[i].stored.size()) << saved.controls[i].name;
@@ -182,10 +182,10 @@ TEST_F(FormFileTest, BadFilesNameTheLine) {
 }
 
 TEST_F(FormFileTest, OpeningSettingsThatFailNameTheirLine) {
-    const FormSpec spec = parse("form \"F\"\ncontrol KelDateMask d\n  at 1 1\n  set CalendarPosition 300\nend\n");
+    const SavedForm saved = parse("form \"F\"\ncontrol KelDateMask d\n  at 1 1\n  set CalendarPosition 300\nend\n");
     mini::Form form;
     try {
-        open_form(form, spec, classes(), "t.kform", day(2026, 1, 1));
+        open_form(form, saved, classes(), "t.kform", day(2026, 1, 1));
         ADD_FAILURE() << "no error";
     } catch (const FormFileError& e) {
         EXPECT_EQ(e.line(), 4);
@@ -209,9 +209,9 @@ TEST_F(FormFileTest, FinancialYearRunsFromAprilToMarch) {
         EXPECT_EQ(setting_value("today", c.today), Variant(c.today));
     }
     // The demo's voucher date is held to that year.
-    const FormSpec spec = parse(demo_form_text());
+    const SavedForm saved = parse(demo_form_text());
     mini::Form form;
-    open_form(form, spec, classes(), "voucher.kform", day(2026, 12, 6));
+    open_form(form, saved, classes(), "voucher.kform", day(2026, 12, 6));
     auto& date = form.find("VoucherDate")->dispatch();
     EXPECT_EQ(date.get("MinDate"), Variant(day(2026, 4, 1)));
     EXPECT_EQ(date.get("MaxDate"), Variant(day(2027, 3, 31)));
@@ -231,11 +231,11 @@ TEST_F(FormFileTest, WrittenFilesKeepCommentsLabelsAndSettings) {
         "    set MinValue 5\n"
         "end\n"
         "# tail\n";
-    const FormSpec spec = parse(text);
-    ASSERT_EQ(spec.controls.size(), 1u);
-    EXPECT_EQ(spec.title, "T \xE9");
-    EXPECT_EQ(spec.controls[0].label_row, 3);
-    const std::string written = write_form(spec);
+    const SavedForm saved = parse(text);
+    ASSERT_EQ(saved.controls.size(), 1u);
+    EXPECT_EQ(saved.title, "T \xE9");
+    EXPECT_EQ(saved.controls[0].label_row, 3);
+    const std::string written = write_form(saved);
     EXPECT_EQ(written,
               "# head\n"
               "form \"T \\xE9\"\n"
@@ -256,14 +256,14 @@ TEST_F(FormFileTest, WrittenFilesKeepCommentsLabelsAndSettings) {
 
 TEST_F(FormFileTest, FilesAreWrittenWholeAndReadBack) {
     TempDir dir;
-    const FormSpec spec = parse(demo_form_text());
+    const SavedForm saved = parse(demo_form_text());
     const std::string path = (dir / "v.kform").string();
-    write_form_file(path, spec);
+    write_form_file(path, saved);
     EXPECT_EQ(read_text(path), std::string(demo_form_text()));
     EXPECT_FALSE(std::filesystem::exists(path + ".saving"));
     EXPECT_EQ(write_form(read_form_file(path, classes())), std::string(demo_form_text()));
     EXPECT_THROW(read_form_file((dir / "missing.kform").string(), classes()), FormFileError);
-    EXPECT_THROW(write_form_file((dir / "no" / "such" / "dir.kform").string(), spec), FormFileError);
+    EXPECT_THROW(write_form_file((dir / "no" / "such" / "dir.kform").string(), saved), FormFileError);
 }
 
 TEST_F(FormFileTest, ScriptsLoadAndSaveForms) {
@@ -282,7 +282,7 @@ TEST_F(FormFileTest, ScriptsLoadAndSaveForms) {
     const std::string_view args[] = {"-"};
     EXPECT_EQ(play(args, classes(), in, out, err, [this](Player& p) { add_form_commands(p, classes()); }), 0)
         << err.str();
-    const FormSpec saved = read_form_file(target, classes());
+    const SavedForm saved = read_form_file(target, classes());
     ASSERT_EQ(saved.controls.size(), 8u);
     EXPECT_EQ(saved.title, "Payment voucher");
     EXPECT_EQ(saved.controls[7].name, "Extra");

@@ -23,9 +23,9 @@ constexpr int kPayeeRow = 2, kAmountRow = 6, kDateRow = 8, kPayModeRow = 10, kPe
 class SessionTest : public ::testing::Test {
 protected:
     void SetUp() override {
-        spec = parse_form(demo_form_text(), "voucher.kform", catalogue.classes());
-        open_form(form, spec, catalogue.classes(), "voucher.kform", today);
-        session = std::make_unique<TerminalSession>(form, spec, today);
+        saved = parse_form(demo_form_text(), "voucher.kform", catalogue.classes());
+        open_form(form, saved, catalogue.classes(), "voucher.kform", today);
+        session = std::make_unique<TerminalSession>(form, saved, today);
     }
 
     TerminalSession::Outcome key(int16_t k, int16_t shift = 0) { return session->handle(Input::key_of(k, shift)); }
@@ -61,7 +61,7 @@ protected:
 
     const Date today = make_date(2026, 12, 6).value();
     Catalogue catalogue;
-    FormSpec spec;
+    SavedForm saved;
     mini::Form form;
     std::unique_ptr<TerminalSession> session;
 };
@@ -263,15 +263,15 @@ TEST_F(SessionTest, TinyAndHugeScreensDrawWithoutHarm) {
 
 TEST(SessionForms, LockedFieldsAreGreyAndTakeNoFocusOrClicks) {
     Catalogue catalogue;
-    const FormSpec spec = parse_form(
+    const SavedForm saved = parse_form(
         "form \"F\"\n"
         "control KelAlphaNumeric A\n label \"First\"\n at 2 10\n size 1210 300\nend\n"
         "control KelAlphaNumeric B\n label \"Locked\"\n at 4 10\n size 1210 300\n store Locked true\n"
         " store Text \"kept\"\nend\n",
         "f.kform", catalogue.classes());
     mini::Form form;
-    open_form(form, spec, catalogue.classes(), "f.kform", make_date(2026, 1, 1).value());
-    TerminalSession session(form, spec, make_date(2026, 1, 1).value());
+    open_form(form, saved, catalogue.classes(), "f.kform", make_date(2026, 1, 1).value());
+    TerminalSession session(form, saved, make_date(2026, 1, 1).value());
     Canvas c(24, 80);
     session.render(c);
     EXPECT_EQ(c.row_text(4), "  Locked kept");
@@ -287,9 +287,9 @@ TEST(SessionForms, LockedFieldsAreGreyAndTakeNoFocusOrClicks) {
 
 TEST(SessionForms, AnEmptyFormStillRunsAndFinishes) {
     Catalogue catalogue;
-    const FormSpec spec = parse_form("form \"Nothing\"\n", "e.kform", catalogue.classes());
+    const SavedForm saved = parse_form("form \"Nothing\"\n", "e.kform", catalogue.classes());
     mini::Form form;
-    TerminalSession session(form, spec, make_date(2026, 1, 1).value());
+    TerminalSession session(form, saved, make_date(2026, 1, 1).value());
     for (int16_t k : {int16_t{mini::kVkTab}, int16_t{mini::kVkDown}, kF4, int16_t{mini::kVkInsert}})
         EXPECT_EQ(session.handle(Input::key_of(k)), TerminalSession::Outcome::going_on);
     session.handle(Input::char_of(U'x'));
