@@ -510,11 +510,14 @@ void TerminalSession::handle_click(int row, int col) {
             const auto text = peek(field, "Text");
             const int length = text ? static_cast<int>(text->str().size()) : 0;
             const int pos = std::clamp(col - l.edit.col + scroll_[c.name()], 0, length);
+            // A plain edit box reports the mouse and the click; the masked box and the combo's
+            // edit field only move their caret.
+            const bool reports = field && field->widget_type() == "EditBox";
             const float x = static_cast<float>((col - l.edit.col) * kTwipsPerCell);
-            form_.mouse(c, *field, true, 1, 0, x, 150);
+            if (reports) form_.mouse(c, *field, true, 1, 0, x, 150);
             form_.select(c, pos, 0);
-            form_.mouse(c, *field, false, 1, 0, x, 150);
-            if (form_.focused() == &c) form_.click(c, *field);
+            if (reports) form_.mouse(c, *field, false, 1, 0, x, 150);
+            if (reports && form_.focused() == &c) form_.click(c, *field);
         }
         return;
     }

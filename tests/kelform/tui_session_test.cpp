@@ -213,8 +213,17 @@ TEST_F(SessionTest, InsertTogglesOverwriteShownOnTheStatusLine) {
 }
 
 TEST_F(SessionTest, ClicksFocusFieldsAndPressTheSpinButtons) {
+    // A click in a field gives it focus and puts the caret under the mouse.
+    session->handle(Input::click_at(kDateRow, 22));
+    ASSERT_EQ(focused(), "VoucherDate");
+    EXPECT_TRUE(session->status().empty()) << session->status();
+    EXPECT_EQ(form.find("VoucherDate")->dispatch().get("SelStart"), Variant(int32_t{3}));
+    session->handle(Input::click_at(kPayModeRow, 20));
+    ASSERT_EQ(focused(), "PayMode");
+    EXPECT_TRUE(session->status().empty()) << session->status();
     session->handle(Input::click_at(kAmountRow, 20));
     ASSERT_EQ(focused(), "Amount");
+    EXPECT_TRUE(logged("event Amount.Click"));
     type(U"500");
     click_on(kAmountRow, U'▲');
     EXPECT_EQ(text("Amount"), Variant(600.0));
