@@ -5,6 +5,7 @@
 #include <cmath>
 #include <cstdio>
 #include <ctime>
+#include <filesystem>
 #include <fstream>
 #include <limits>
 #include <sstream>
@@ -337,6 +338,8 @@ SavedForm parse_form(std::string_view text, const std::string& file, std::span<c
 }
 
 SavedForm read_form_file(const std::string& path, std::span<const ClassInfo> classes) {
+    std::error_code ec;
+    if (std::filesystem::is_directory(path, ec)) throw FormFileError(path, 0, "is a directory, not a form file");
     std::ifstream in(path, std::ios::binary);
     if (!in) throw FormFileError(path, 0, "cannot open the file");
     std::ostringstream text;

@@ -263,6 +263,7 @@ TEST_F(FormFileTest, FilesAreWrittenWholeAndReadBack) {
     EXPECT_FALSE(std::filesystem::exists(path + ".saving"));
     EXPECT_EQ(write_form(read_form_file(path, classes())), std::string(demo_form_text()));
     EXPECT_THROW(read_form_file((dir / "missing.kform").string(), classes()), FormFileError);
+    EXPECT_THROW(read_form_file((dir / "").string(), classes()), FormFileError);
     EXPECT_THROW(write_form_file((dir / "no" / "such" / "dir.kform").string(), saved), FormFileError);
 }
 
