@@ -640,6 +640,8 @@ void TerminalSession::draw_control(Canvas& canvas, const Layout& l, bool focused
     label_style.bold = focused;
     label_style.dim = !enabled;
     canvas.put_text(l.label.row, l.label.col, l.saved->label, label_style);
+    // A marker before the label shows which field has focus, also on a terminal without colour.
+    if (focused && l.label.col >= 2) canvas.put(l.label.row, l.label.col - 2, U'▸', label_style);
 
     CellStyle style;
     style.fg = peek_colour(field, "ForeColor");
