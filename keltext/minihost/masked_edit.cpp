@@ -77,8 +77,16 @@ bool MiniMaskedEdit::put_char(char c) {
 void MiniMaskedEdit::remove_at(int32_t pos) {
     int32_t end = pos;
     while (end < length() && input_at(end)) ++end;
-    for (int32_t i = pos; i + 1 < end; ++i) text_[static_cast<std::size_t>(i)] = text_[static_cast<std::size_t>(i + 1)];
-    text_[static_cast<std::size_t>(end - 1)] = kPrompt;
+    // The rest of the field moves one place left, but only as far as each character fits the
+    // position it moves into: a letter never lands on a digit position. Where the move stops,
+    // the gap shows the prompt and the characters after it stay where they are.
+    int32_t i = pos;
+    for (; i + 1 < end; ++i) {
+        const char next = text_[static_cast<std::size_t>(i + 1)];
+        if (next != kPrompt && !fits(next, mask_[static_cast<std::size_t>(i)])) break;
+        text_[static_cast<std::size_t>(i)] = next;
+    }
+    text_[static_cast<std::size_t>(i)] = kPrompt;
 }
 
 void MiniMaskedEdit::remove_selection() {

@@ -45,6 +45,8 @@ TEST(MaskedEdit, TypingAndDeleting) {
         {"? takes a letter, not a digit", "##/##?", "05/03_", 5, 0, {"type:7", "type:a"}, "05/03a", 6, 1},
         {"a takes letters and digits, not blanks", "##/##a", "05/03_", 5, 0, {"type: ", "type:7"}, "05/037", 6, 1},
         {"& takes a blank", "##/##&", "05/03_", 5, 0, {"type: "}, "05/03 ", 6, 1},
+        {"delete moves a letter only where it fits", "##/##a", "05/03A", 3, 0, {"down:46"}, "05/3_A", 3, 1},
+        {"backspace moves a letter only where it fits", "##/##a", "05/03A", 4, 0, {"press:8"}, "05/3_A", 3, 1},
         {"control codes insert nothing", date, "", 0, 0, {"press:9", "press:13"}, "__/__/____", 0, 0},
         {"paste types what fits", date, "", 0, 0, {"paste:1x2/2003"}, "12/20/03__", 8, 1},
         {"the empty mask is a plain box", "", "12/x", 4, 0, {"type:yz", "press:8"}, "12/xy", 5, 3},
