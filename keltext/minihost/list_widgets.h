@@ -49,6 +49,7 @@ public:
     void RemoveItem(int32_t index) override { list_.remove(index); }
     void Clear() override { list_.clear(); }
     std::string List(int32_t index) const override { return list_.text(index); }
+    std::string_view list_text(int32_t index, std::string&) const override { return list_.text(index); }
     void List(int32_t index, const std::string& text) override { list_.set_text(index, text); }
     int32_t ItemData(int32_t index) const override { return list_.data(index); }
     void ItemData(int32_t index, int32_t value) override { list_.set_data(index, value); }
@@ -90,6 +91,7 @@ public:
     void RemoveItem(int32_t index) override { list_.remove(index); }
     void Clear() override { list_.clear(); }
     std::string List(int32_t index) const override { return list_.text(index); }
+    std::string_view list_text(int32_t index, std::string&) const override { return list_.text(index); }
     void List(int32_t index, const std::string& text) override { list_.set_text(index, text); }
     int32_t ItemData(int32_t index) const override { return list_.data(index); }
     void ItemData(int32_t index, int32_t value) override { list_.set_data(index, value); }
