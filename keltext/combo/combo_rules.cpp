@@ -27,25 +27,16 @@ bool search_ignores_key(int16_t key_code) {
     return (key_code >= 1 && key_code <= 31) || (key_code >= 33 && key_code <= 47) || key_code == 144;
 }
 
-int32_t find_completion(std::string_view typed, int32_t count, bool sorted,
-                        const std::function<std::string_view(int32_t)>& entry) {
+int prefix_order(std::string_view entry, std::string_view typed) {
     const std::size_t n = typed.size();
-    for (int32_t i = 0; i < count; ++i) {
-        const std::string_view e = entry(i);
-        const std::size_t m = std::min(n, e.size());
-        // Compare the entry's first m characters with the typed text, both upper-cased,
-        // by character code; the entry's prefix is the shorter when it runs out first.
-        int order = 0;
-        for (std::size_t j = 0; j < m && order == 0; ++j) {
-            const uint8_t a = upper_case(byte_of(e[j]));
-            const uint8_t b = upper_case(byte_of(typed[j]));
-            if (a != b) order = a < b ? -1 : 1;
-        }
-        if (order == 0 && m < n) order = -1;
-        if (order == 0) return i;
-        if (sorted && order > 0) return -1;
+    const std::size_t m = std::min(n, entry.size());
+    // The entry's prefix is the shorter when it runs out first.
+    for (std::size_t j = 0; j < m; ++j) {
+        const uint8_t a = upper_case(byte_of(entry[j]));
+        const uint8_t b = upper_case(byte_of(typed[j]));
+        if (a != b) return a < b ? -1 : 1;
     }
-    return -1;
+    return m < n ? -1 : 0;
 }
 
 std::string title_case_edit(std::string_view text, int32_t p_in, int32_t sel_length, bool overwrite, char c) {

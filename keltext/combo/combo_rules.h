@@ -3,7 +3,6 @@
 // character filter of the edit field. The control reads its widget into these structs, calls
 // the rule and writes the decision back through the widget.
 #include <cstdint>
-#include <functional>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -35,8 +34,24 @@ bool search_ignores_key(int16_t key_code);
 // upper case; -1 when there is none. In a sorted list the search stops at the first entry
 // that sorts after the typed text. `entry(i)` gives the text of entry i; the view only has
 // to stay valid until the next call. Allocates nothing.
-int32_t find_completion(std::string_view typed, int32_t count, bool sorted,
-                        const std::function<std::string_view(int32_t)>& entry);
+template <class EntryText>
+int32_t find_completion(std::string_view typed, int32_t count, bool sorted, EntryText&& entry);
+
+// How an entry's first characters compare with the typed text, both upper-cased, by character
+// code: below 0, 0 (the entry starts with the typed text) or above 0.
+int prefix_order(std::string_view entry, std::string_view typed);
+
+// A template, so that the search calls the list directly: it runs once per entry, over lists
+// of a million entries.
+template <class EntryText>
+int32_t find_completion(std::string_view typed, int32_t count, bool sorted, EntryText&& entry) {
+    for (int32_t i = 0; i < count; ++i) {
+        const int order = prefix_order(entry(i), typed);
+        if (order == 0) return i;
+        if (sorted && order > 0) return -1;
+    }
+    return -1;
+}
 
 // --- Character filter ----------------------------------------------------------------------
 

@@ -54,9 +54,14 @@ int32_t item_data_of(double value) {
 
 std::string EncodeFillList(const ListWidget& list) {
     std::string out;
+    std::string scratch;
     const int32_t count = list.ListCount();
+    // Size the string once: a million entries would otherwise grow it by doubling many times.
+    std::size_t size = 0;
+    for (int32_t i = 0; i < count; ++i) size += list.list_text(i, scratch).size() + 14;
+    out.reserve(size);
     for (int32_t i = 0; i < count; ++i) {
-        const std::string text = list.List(i);
+        const std::string_view text = list.list_text(i, scratch);
         // Spaces at the start of a list string are dropped when it is read; an empty entry in
         // front keeps the first text's leading spaces (and reads as nothing).
         if (i == 0 && !text.empty() && text.front() == ' ') out += kEntrySeparator;
