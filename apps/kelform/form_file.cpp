@@ -93,7 +93,14 @@ private:
         if (words.empty()) {
             // Keep comment lines (not blank ones) so that saving the form keeps them.
             const auto first = line.find_first_not_of(" \t");
-            if (first != std::string_view::npos && line[first] == '#') pending_comments_.emplace_back(line.substr(first));
+            if (first != std::string_view::npos && line[first] == '#') {
+                // Without the blanks and carriage returns at its end, so that a file written with
+                // "\r\n" line ends reads and writes back the same comment every time.
+                std::string_view comment = line.substr(first);
+                while (!comment.empty() && (comment.back() == '\r' || comment.back() == ' ' || comment.back() == '\t'))
+                    comment.remove_suffix(1);
+                pending_comments_.emplace_back(comment);
+            }
             return;
         }
         const std::string keyword(words[0]);

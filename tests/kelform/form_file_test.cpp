@@ -254,6 +254,14 @@ TEST_F(FormFileTest, WrittenFilesKeepCommentsLabelsAndSettings) {
     EXPECT_EQ(write_form(parse(written)), written);
 }
 
+TEST_F(FormFileTest, CarriageReturnLineEndsReadLikeLineFeeds) {
+    // Files edited on another system: comments keep neither "\r" nor trailing blanks, so a
+    // written file reads and writes back to the same text.
+    const std::string written = write_form(parse("# head \r\r\nform \"T\"\r\n# about a\r\ncontrol KelNumeric a\r\n    at 3 20\r\nend\r\n"));
+    EXPECT_EQ(written.find('\r'), std::string::npos);
+    EXPECT_EQ(write_form(parse(written)), written);
+}
+
 TEST_F(FormFileTest, FilesAreWrittenWholeAndReadBack) {
     TempDir dir;
     const SavedForm saved = parse(demo_form_text());
