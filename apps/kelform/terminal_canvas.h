@@ -57,7 +57,4 @@ private:
     std::optional<std::pair<int, int>> cursor_;
 };
 
-// Appends the UTF-8 form of a code point.
-void append_utf8(std::string& out, char32_t cp);
-
 }  // namespace kel::kelform

@@ -15,17 +15,6 @@ using T = KelAlphaNumeric;
 KelANTxtType as_text_type(const Variant& v) { return static_cast<KelANTxtType>(to_int32(v)); }
 KelANBorderStyle as_border_style(const Variant& v) { return static_cast<KelANBorderStyle>(to_int32(v)); }
 
-std::shared_ptr<Font> as_font(const Variant& v) {
-    auto f = font_of(v);
-    if (!f) raise_error(kTypeMismatch);
-    return f;
-}
-
-std::vector<ArgInfo> key_args() { return {{"KeyCode", "Integer"}, {"Shift", "Integer"}}; }
-std::vector<ArgInfo> mouse_args() {
-    return {{"Button", "Integer"}, {"Shift", "Integer"}, {"X", "Single"}, {"Y", "Single"}};
-}
-
 }  // namespace
 
 ClassInfo kel_alpha_numeric_class() {
@@ -49,7 +38,7 @@ ClassInfo kel_alpha_numeric_class() {
                   [](T& c, const Variant& v) { c.ForeColor(to_int32(v)); },
                   "Returns/sets the text color")
         .property("Font", "Font", [](T& c) { return c.Font() ? Variant(c.Font()) : Variant(); },
-                  [](T& c, const Variant& v) { c.Font(as_font(v)); }, "Returns/sets the font of the text")
+                  [](T& c, const Variant& v) { c.Font(require_font(v)); }, "Returns/sets the font of the text")
         .property("MaxLength", "Variant", [](T& c) { return c.MaxLength(); },
                   [](T& c, const Variant& v) { c.MaxLength(v); },
                   "Returns/sets the most characters the box takes from the keyboard (0: no limit)")
@@ -83,13 +72,13 @@ ClassInfo kel_alpha_numeric_class() {
         .event(T::kClick, "Click", {}, "Occurs when the user clicks the box")
         .event(T::kDblClick, "DblClick", {}, "Occurs when the user double-clicks the box")
         .event(T::kChange, "Change", {}, "Occurs when the text has changed")
-        .event(T::kKeyDown, "KeyDown", key_args(), "Occurs when the user presses a key")
+        .event(T::kKeyDown, "KeyDown", key_event_args(), "Occurs when the user presses a key")
         .event(T::kKeyPress, "KeyPress", {{"KeyAscii", "Integer"}},
                "Occurs when the user types a character, before the box filters it")
-        .event(T::kKeyUp, "KeyUp", key_args(), "Occurs when the user releases a key")
-        .event(T::kMouseDown, "MouseDown", mouse_args(), "Occurs when the user presses a mouse button")
-        .event(T::kMouseMove, "MouseMove", mouse_args(), "Occurs when the user moves the mouse")
-        .event(T::kMouseUp, "MouseUp", mouse_args(), "Occurs when the user releases a mouse button")
+        .event(T::kKeyUp, "KeyUp", key_event_args(), "Occurs when the user releases a key")
+        .event(T::kMouseDown, "MouseDown", mouse_event_args(), "Occurs when the user presses a mouse button")
+        .event(T::kMouseMove, "MouseMove", mouse_event_args(), "Occurs when the user moves the mouse")
+        .event(T::kMouseUp, "MouseUp", mouse_event_args(), "Occurs when the user releases a mouse button")
         .enumeration("KelANTxtType", {{"KelANTitleCase", KelANTitleCase},
                                       {"KelANUpperCase", KelANUpperCase},
                                       {"KelANCommStyle", KelANCommStyle},

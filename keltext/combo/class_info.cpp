@@ -108,9 +108,9 @@ ClassInfo kel_combo_class() {
         .event(2, "DblClick")
         .event(3, "DropDown")
         .event(4, "Change")
-        .event(5, "KeyDown", {{"KeyCode", "Integer"}, {"Shift", "Integer"}})
+        .event(5, "KeyDown", key_event_args())
         .event(6, "KeyPress", {{"KeyAscii", "Integer"}})
-        .event(7, "KeyUp", {{"KeyCode", "Integer"}, {"Shift", "Integer"}})
+        .event(7, "KeyUp", key_event_args())
         .event(8, "Scroll")
         .enumeration("KelCboType", {{"KelCboTitleCase", KelCboTitleCase},
                                     {"KelCboUserKeys", KelCboUserKeys},

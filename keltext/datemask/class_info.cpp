@@ -8,8 +8,8 @@ namespace kel {
 
 ClassInfo kel_date_mask_class() {
     using C = KelDateMask;
-    const std::vector<ArgInfo> key_args{{"KeyCode", "Integer"}, {"Shift", "Integer"}};
-    const std::vector<ArgInfo> mouse_args{{"Button", "Integer"}, {"Shift", "Integer"}, {"X", "Single"}, {"Y", "Single"}};
+    const std::vector<ArgInfo> key_args = key_event_args();
+    const std::vector<ArgInfo> mouse_args = mouse_event_args();
     return ClassBuilder<C>("KelDateMask", "Masked date box with a calendar button")
         .property("ZubDate", "Boolean", [](C& c) { return Variant(c.ZubDate()); },
                   [](C& c, const Variant& v) { c.ZubDate(to_bool(v)); },

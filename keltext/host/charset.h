@@ -21,6 +21,8 @@ char32_t to_unicode(uint8_t c);
 std::optional<uint8_t> from_unicode(char32_t cp);
 
 std::string to_utf8(std::string_view cp1252);
+// Appends the UTF-8 form of any code point.
+void append_utf8(std::string& out, char32_t cp);
 // Characters the set lacks (and malformed UTF-8) are dropped, or replaced by `replacement`.
 std::string from_utf8(std::string_view utf8, std::optional<char> replacement = std::nullopt);
 

@@ -38,5 +38,7 @@ inline std::shared_ptr<Font> default_font() { return std::make_shared<Font>("Fix
 
 // The font object a value holds, or null when it holds none.
 std::shared_ptr<Font> font_of(const Variant& v);
+// The same for a property set: a value that holds no font is a type mismatch (13).
+std::shared_ptr<Font> require_font(const Variant& v);
 
 }  // namespace kel

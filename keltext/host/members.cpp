@@ -15,6 +15,12 @@ auto find_named(const List& list, std::string_view name) -> decltype(&list.front
 
 }  // namespace
 
+std::vector<ArgInfo> key_event_args() { return {{"KeyCode", "Integer"}, {"Shift", "Integer"}}; }
+
+std::vector<ArgInfo> mouse_event_args() {
+    return {{"Button", "Integer"}, {"Shift", "Integer"}, {"X", "Single"}, {"Y", "Single"}};
+}
+
 const PropertyInfo* ClassInfo::find_property(std::string_view name) const { return find_named(properties, name); }
 const MethodInfo* ClassInfo::find_method(std::string_view name) const { return find_named(methods, name); }
 const EventInfo* ClassInfo::find_event(std::string_view name) const { return find_named(events, name); }

@@ -101,6 +101,10 @@ private:
     const ClassInfo& info_;
 };
 
+// The by-reference arguments of the key and mouse events the controls raise.
+std::vector<ArgInfo> key_event_args();    // KeyCode, Shift
+std::vector<ArgInfo> mouse_event_args();  // Button, Shift, X, Y
+
 // Builds a class table with typed accessors:
 //   ClassBuilder<KelAlphaNumeric>("KelAlphaNumeric", "...")
 //       .property("TextType", "KelANTxtType", &get, &set, "description")

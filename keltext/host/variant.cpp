@@ -1,5 +1,6 @@
 #include "keltext/host/variant.h"
 
+#include "keltext/host/errors.h"
 #include "keltext/host/font.h"
 
 namespace kel {
@@ -56,5 +57,11 @@ std::string_view kind_name(VarKind k) {
 }
 
 std::shared_ptr<Font> font_of(const Variant& v) { return std::dynamic_pointer_cast<Font>(v.object()); }
+
+std::shared_ptr<Font> require_font(const Variant& v) {
+    auto f = font_of(v);
+    if (!f) raise_error(kTypeMismatch);
+    return f;
+}
 
 }  // namespace kel

@@ -12,17 +12,6 @@ using T = KelNumeric;
 
 // Late-bound values arrive as variants and are converted as the published parameter types
 // take them: a value that does not convert is the caller's error (13 or 6).
-std::shared_ptr<Font> as_font(const Variant& v) {
-    auto f = font_of(v);
-    if (!f) raise_error(kTypeMismatch);
-    return f;
-}
-
-std::vector<ArgInfo> key_args() { return {{"KeyCode", "Integer"}, {"Shift", "Integer"}}; }
-std::vector<ArgInfo> mouse_args() {
-    return {{"Button", "Integer"}, {"Shift", "Integer"}, {"X", "Single"}, {"Y", "Single"}};
-}
-
 }  // namespace
 
 ClassInfo kel_numeric_class() {
@@ -56,7 +45,7 @@ ClassInfo kel_numeric_class() {
                   [](T& c, const Variant& v) { c.ForeColor(to_int32(v)); },
                   "Returns/Sets  the Foreground color used to ")
         .property("Font", "Font", [](T& c) { return c.Font() ? Variant(c.Font()) : Variant(); },
-                  [](T& c, const Variant& v) { c.Font(as_font(v)); }, "Returns a  Font Object")
+                  [](T& c, const Variant& v) { c.Font(require_font(v)); }, "Returns a  Font Object")
         .property("MaxLength", "Integer", [](T& c) { return Variant(c.MaxLength()); },
                   [](T& c, const Variant& v) { c.MaxLength(to_int16(v)); },
                   "Returns/Sets Maximum Length includes the decimal point and decimal part")
@@ -81,12 +70,12 @@ ClassInfo kel_numeric_class() {
         .event(T::kClick, "Click")
         .event(T::kDblClick, "DblClick")
         .event(T::kChange, "Change")
-        .event(T::kKeyDown, "KeyDown", key_args())
+        .event(T::kKeyDown, "KeyDown", key_event_args())
         .event(T::kKeyPress, "KeyPress", {{"KeyAscii", "Integer"}})
-        .event(T::kKeyUp, "KeyUp", key_args())
-        .event(T::kMouseDown, "MouseDown", mouse_args())
-        .event(T::kMouseMove, "MouseMove", mouse_args())
-        .event(T::kMouseUp, "MouseUp", mouse_args())
+        .event(T::kKeyUp, "KeyUp", key_event_args())
+        .event(T::kMouseDown, "MouseDown", mouse_event_args())
+        .event(T::kMouseMove, "MouseMove", mouse_event_args())
+        .event(T::kMouseUp, "MouseUp", mouse_event_args())
         .event(T::kControlError, "ControlError")
         .enumeration("KelNBorderStyle", {{"KelNPlain", KelNPlain}, {"KelNFixedSingle", KelNFixedSingle}})
         .build();
