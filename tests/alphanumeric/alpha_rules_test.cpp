@@ -30,55 +30,20 @@ TEST_P(FilterByType, KeyComesOutAsExpected) {
 constexpr int16_t ch(char c) { return static_cast<int16_t>(static_cast<unsigned char>(c)); }
 
 INSTANTIATE_TEST_SUITE_P(
-    Digits, FilterByType,
-    ::testing::Values(FilterCase{KelANDigits, ch('5'), ch('5')}, FilterCase{KelANDigits, ch('0'), ch('0')},
-                      FilterCase{KelANDigits, ch('9'), ch('9')}, FilterCase{KelANDigits, ch(' '), ch(' ')},
-                      FilterCase{KelANDigits, ch('.'), 0}, FilterCase{KelANDigits, ch('-'), 0},
-                      FilterCase{KelANDigits, ch('+'), 0}, FilterCase{KelANDigits, ch('a'), 0},
-                      FilterCase{KelANDigits, 0xB2, 0} /* superscript two */, FilterCase{KelANDigits, 0, 0},
-                      FilterCase{KelANDigits, 27, 0}, FilterCase{KelANDigits, 300, 0},
-                      FilterCase{KelANDigits, -49, 0}));
-
-INSTANTIATE_TEST_SUITE_P(
-    UAlphaNumeric, FilterByType,
-    ::testing::Values(FilterCase{KelANUAlphaNumeric, ch('a'), ch('A')},
-                      FilterCase{KelANUAlphaNumeric, ch('z'), ch('Z')},
-                      FilterCase{KelANUAlphaNumeric, ch('Q'), ch('Q')},
-                      FilterCase{KelANUAlphaNumeric, ch('1'), ch('1')},
-                      FilterCase{KelANUAlphaNumeric, ch(' '), ch(' ')}, FilterCase{KelANUAlphaNumeric, ch('-'), 0},
-                      FilterCase{KelANUAlphaNumeric, ch('.'), 0}, FilterCase{KelANUAlphaNumeric, ch('@'), 0},
+    AllTypes, FilterByType,
+    ::testing::Values(FilterCase{KelANDigits, ch('5'), ch('5')}, FilterCase{KelANDigits, ch(' '), ch(' ')},
+                      FilterCase{KelANDigits, ch('.'), 0}, FilterCase{KelANDigits, ch('a'), 0},
+                      FilterCase{KelANDigits, 0xB2, 0} /* superscript two */, FilterCase{KelANDigits, 300, 0},
+                      FilterCase{KelANDigits, -49, 0}, FilterCase{KelANUAlphaNumeric, ch('z'), ch('Z')},
                       FilterCase{KelANUAlphaNumeric, ch('_'), 0},
-                      FilterCase{KelANUAlphaNumeric, 0xE9, 0} /* e acute: not in the set */));
-
-INSTANTIATE_TEST_SUITE_P(
-    CommStyle, FilterByType,
-    ::testing::Values(FilterCase{KelANCommStyle, ch('@'), ch('@')}, FilterCase{KelANCommStyle, ch('#'), ch('#')},
-                      FilterCase{KelANCommStyle, ch('*'), ch('*')}, FilterCase{KelANCommStyle, ch('('), ch('(')},
-                      FilterCase{KelANCommStyle, ch(')'), ch(')')}, FilterCase{KelANCommStyle, ch('['), ch('[')},
-                      FilterCase{KelANCommStyle, ch(']'), ch(']')}, FilterCase{KelANCommStyle, ch('{'), ch('{')},
-                      FilterCase{KelANCommStyle, ch('}'), ch('}')}, FilterCase{KelANCommStyle, ch('-'), ch('-')},
-                      FilterCase{KelANCommStyle, ch('_'), ch('_')}, FilterCase{KelANCommStyle, ch(' '), ch(' ')},
-                      FilterCase{KelANCommStyle, ch('7'), ch('7')}, FilterCase{KelANCommStyle, ch('a'), ch('a')},
-                      FilterCase{KelANCommStyle, ch('Z'), ch('Z')}, FilterCase{KelANCommStyle, ch('.'), 0},
-                      FilterCase{KelANCommStyle, ch(','), 0}, FilterCase{KelANCommStyle, ch('/'), 0},
+                      FilterCase{KelANUAlphaNumeric, 0xE9, 0} /* e acute: not in the set */,
+                      FilterCase{KelANCommStyle, ch('}'), ch('}')}, FilterCase{KelANCommStyle, ch('_'), ch('_')},
                       FilterCase{KelANCommStyle, ch('&'), 0}, FilterCase{KelANCommStyle, ch('\''), 0},
-                      FilterCase{KelANCommStyle, ch('+'), 0}, FilterCase{KelANCommStyle, ch('<'), 0}));
-
-INSTANTIATE_TEST_SUITE_P(
-    UpperCase, FilterByType,
-    ::testing::Values(FilterCase{KelANUpperCase, ch('a'), ch('A')}, FilterCase{KelANUpperCase, ch('B'), ch('B')},
-                      FilterCase{KelANUpperCase, ch('1'), ch('1')}, FilterCase{KelANUpperCase, ch('-'), ch('-')},
-                      FilterCase{KelANUpperCase, ch('.'), ch('.')},
+                      FilterCase{KelANCommStyle, ch('<'), 0},
                       FilterCase{KelANUpperCase, 0xE9, 0xC9} /* e acute to E acute */,
                       FilterCase{KelANUpperCase, 0xFF, 0x9F} /* y diaeresis */,
-                      FilterCase{KelANUpperCase, 0, 0}, FilterCase{KelANUpperCase, 300, 300}));
-
-INSTANTIATE_TEST_SUITE_P(
-    UserKeysAndUnknown, FilterByType,
-    ::testing::Values(FilterCase{KelANUserKeys, ch('a'), ch('a')}, FilterCase{KelANUserKeys, ch('.'), ch('.')},
-                      FilterCase{KelANUserKeys, 0, 0}, FilterCase{KelANUserKeys, 27, 27},
-                      FilterCase{7, ch('a'), ch('a')}, FilterCase{-1, ch('x'), ch('x')},
-                      FilterCase{1000000, ch('!'), ch('!')}));
+                      FilterCase{KelANUpperCase, 300, 300}, FilterCase{KelANUserKeys, 27, 27},
+                      FilterCase{-1, ch('x'), ch('x')}, FilterCase{1000000, ch('!'), ch('!')}));
 
 // Sentence case capitalises only at the very start of the text.
 TEST(SentenceFilter, UpperCaseOnlyAtCaretZero) {
@@ -157,16 +122,13 @@ TEST_P(TitleCaseRebuild, Rebuilds) {
 
 const TitleCase kTitleCases[] = {
     {"EmptyBoxTakesAnyCharacterUpperCased", "", 0, 0, 0, false, ch('j'), "J", std::nullopt},
-    {"EmptyBoxTakesSpace", "", 0, 0, 0, false, ch(' '), " ", std::nullopt},
     {"EmptyBoxIgnoresLimit", "", 0, 0, 0, true, ch('x'), "X", std::nullopt},
     {"SpaceAtEndCapitalisesFirstLetter", "john", 4, 0, 0, false, ch(' '), "John ", 5},
     {"LetterAfterSpace", "John ", 5, 0, 0, false, ch('s'), "John S", std::nullopt},
-    {"LetterInsideWordKeepsCase", "John S", 6, 0, 0, false, ch('m'), "John Sm", std::nullopt},
     {"UpperCaseInsideWordIsNotLowered", "Jo", 2, 0, 0, false, ch('H'), "JoH", std::nullopt},
     {"SpaceSplitsWord", "Johnsmith", 4, 0, 0, false, ch(' '), "John Smith", std::nullopt},
     {"SpaceBeforeSpace", "John Smith", 4, 0, 0, false, ch(' '), "John  Smith", 5},
     {"HyphenIsNoWordBoundary", "a-b", 3, 0, 0, false, ch('c'), "A-bc", std::nullopt},
-    {"PeriodIsNoWordBoundary", "Mr.", 3, 0, 0, false, ch('x'), "Mr.x", std::nullopt},
     {"LetterAtStartOfText", "ohn", 0, 0, 0, false, ch('j'), "John", std::nullopt},
     {"InsertFullBoxRefuses", "Abcde", 2, 0, 5, false, ch('x'), "Abcde", std::nullopt},
     {"TrailingSpacesDoNotCountForLetters", "Abc  ", 2, 0, 5, false, ch('x'), "Abxc  ", std::nullopt},
@@ -182,7 +144,6 @@ const TitleCase kTitleCases[] = {
     {"OverwriteSpaceOnLastCharacter", "Abc", 2, 0, 0, true, ch(' '), "Ab ", std::nullopt},
     {"OverwriteSpaceOverSpaceStepsOver", "Ab cd", 2, 0, 0, true, ch(' '), "Ab Cd", 3},
     {"OverwriteSpaceAtEndAppends", "Ab", 2, 0, 0, true, ch(' '), "Ab ", 3},
-    {"SelectionReplacedByLetter", "Abcd", 1, 2, 0, false, ch('x'), "Axd", std::nullopt},
     {"SelectionReplacedByLetterAfterSpace", "Ab cd", 3, 2, 0, false, ch('x'), "Ab X", std::nullopt},
     {"SelectionReplacedBySpace", "Abcd", 1, 2, 0, false, ch(' '), "A D", std::nullopt},
     {"SelectionToEndReplacedBySpace", "Abcd", 1, 3, 0, false, ch(' '), "A ", std::nullopt},
@@ -191,7 +152,6 @@ const TitleCase kTitleCases[] = {
     {"AccentedLetterUpperCased", "Ab ", 3, 0, 0, false, static_cast<int16_t>(0xE9), "Ab \xC9", std::nullopt},
     // Keys that insert nothing into an edit box insert nothing here either.
     {"DroppedKeyLeavesText", "abc", 1, 0, 0, false, 0, nullptr, std::nullopt},
-    {"DroppedKeyLeavesEmptyText", "", 0, 0, 0, false, 0, nullptr, std::nullopt},
     {"EscapeInsertsNothing", "abc", 1, 0, 0, false, 27, nullptr, std::nullopt},
     {"CodeOutsideTheSetInsertsNothing", "abc", 1, 0, 0, false, 400, nullptr, std::nullopt},
     // Out-of-range positions from a misbehaving caller are clamped to the text.

@@ -21,12 +21,8 @@ struct NormalizeCase {
 TEST(NormalizeDateText, Table) {
     const NormalizeCase cases[] = {
         // Day capped by the month.
-        {"31/01/2003", false, false, "31/01/2003"},
         {"32/01/2003", false, false, "31/01/2003"},
         {"31/04/2003", false, false, "30/04/2003"},
-        {"31/06/2003", false, false, "30/06/2003"},
-        {"31/09/2003", false, false, "30/09/2003"},
-        {"31/11/2003", false, false, "30/11/2003"},
         {"99/12/2003", false, false, "31/12/2003"},
         {"45/13/2003", false, false, "31/12/2003"},
         // February: the four-year rule alone, a blank year counts as divisible.
@@ -36,18 +32,15 @@ TEST(NormalizeDateText, Table) {
         {"29/02/1900", false, false, "29/02/1900"},
         {"31/02/2100", false, false, "29/02/2100"},
         {"30/02/    ", false, false, "29/02/    "},
-        {"28/02/2003", false, false, "28/02/2003"},
         // Year widening.
         {"12/05/03  ", false, false, "12/05/2003"},
         {"12/05/45  ", false, false, "12/05/1945"},
         {"12/05/40  ", false, false, "12/05/2040"},
         {"12/05/41  ", false, false, "12/05/1941"},
-        {"12/05/99  ", false, false, "12/05/1999"},
         {"12/05/0   ", false, false, "12/05/2000"},
         {"12/05/203 ", false, false, "12/05/2003"},
         {"12/05/ 03 ", false, false, "12/05/2003"},
         {"12/05/0045", false, false, "12/05/1945"},
-        {"12/05/1999", false, false, "12/05/1999"},
         {"12/05/ab  ", false, false, "12/05/ab  "},
         {"30/02/9e9999", false, false, "29/02/9e9999"},
         {"12/05/2,003", false, false, "12/05/2003"},
@@ -57,9 +50,7 @@ TEST(NormalizeDateText, Table) {
         {"  /  /    ", false, false, "01/01/    "},
         {"  /05/2003", false, false, "01/01/2003"},
         {"00/05/2003", false, false, "01/01/2003"},
-        {" 0/05/2003", false, false, "01/01/2003"},
         {"12/00/2003", false, false, "12/01/2003"},
-        {"12/  /2003", false, false, "12/01/2003"},
         {"5 /  /    ", false, false, "05/01/    "},
         {"256/01/2003", false, false, "01/12/2003"},  // month read from "56"
         {"12/05", false, false, "12/00/"},
@@ -71,17 +62,14 @@ TEST(NormalizeDateText, Table) {
         {"12/05-03  ", false, false, "12/05/2003"},
         // 28-day months.
         {"30/01/2003", true, false, "28/01/2003"},
-        {"31/12/2003", true, false, "28/12/2003"},
         {"45/13/2003", true, false, "28/12/2003"},
         {"29/02/2004", true, false, "28/02/2004"},
-        {"28/05/2003", true, false, "28/05/2003"},
         // No-correction mode: a non-date is left alone, a date keeps its day.
         {"30/01/2003", true, true, "30/01/2003"},
         {"31/04/2003", true, true, "31/04/2003"},
         {"29/02/2003", true, true, "29/02/2003"},
         {"  /  /    ", true, true, "  /  /    "},
         {"12/05/03  ", true, true, "12/05/03  "},
-        {"31/04/2003", false, true, "31/04/2003"},
         {" 5/ 3/2003", false, true, "05/03/2003"},
         {" 5/ 3/2003", true, true, "05/03/2003"},
     };
@@ -122,7 +110,6 @@ TEST(FormatParts, DayAndMonth) {
         {" 5/ 5/    ", "05", "05"},
         {"  /  /    ", "01", "01"},
         {"00/00/    ", "01", "01"},
-        {"31/12/    ", "31", "12"},
         {"32/13/    ", "", ""},
         {"45/10/    ", "", "10"},
         {"09/1 /    ", "09", "01"},
@@ -162,9 +149,7 @@ TEST(ClampToDateRange, Table) {
     const Case cases[] = {
         {"01/01/1999", y2000, none, "01/01/2000"},
         {"01/01/1999", y2000, end1998, "31/12/1998"},  // crossed bounds: the upper one wins
-        {"01/01/2000", y2000, none, "01/01/2000"},
         {"15/06/2005", none, end2004, "31/12/2004"},
-        {"31/12/2004", none, end2004, "31/12/2004"},
         {"15/06/2003", y2000, end2004, "15/06/2003"},
         {"15/06/2003", Variant("31/02/2003"), Variant("xx"), "15/06/2003"},
         {"15/06/1990", Variant("2000-01-01"), none, "01/01/2000"},
@@ -174,12 +159,6 @@ TEST(ClampToDateRange, Table) {
     };
     for (const auto& c : cases) EXPECT_EQ(ClampToDateRange(c.text, c.min, c.max), c.expected) << c.text;
 }
-
-}  // namespace
-}  // namespace kel
-
-namespace kel {
-namespace {
 
 // Every short text over the characters that matter: no rule misbehaves, and the completed
 // fields are always two digits in their range.

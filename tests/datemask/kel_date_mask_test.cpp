@@ -306,21 +306,5 @@ TEST_F(DateMaskTest, ChangeOnlyWhileEnabledAndNotLocked) {
     EXPECT_EQ(rec.count("event Change"), 0);
 }
 
-TEST_F(DateMaskTest, ClassTable) {
-    const auto* text = cls.find_property("text");
-    ASSERT_NE(text, nullptr);
-    EXPECT_EQ(text->flags & kDefaultMember, kDefaultMember);
-    EXPECT_EQ(cls.find_property("ZubDate")->description, "True/False sets No. of days in a month to 28 ");
-    EXPECT_TRUE(cls.find_property("AllowLostFocus")->read_only());
-    EXPECT_EQ(cls.find_event("DateError")->number, 11);
-    EXPECT_EQ(cls.find_event("ButtonClick")->number, 10);
-    std::vector<std::string> names;
-    for (const auto& p : cls.properties) names.push_back(p.name);
-    EXPECT_EQ(names, (std::vector<std::string>{"ZubDate", "MaxDate", "MinDate", "TriggerError", "BackColor",
-                                               "ForeColor", "Font", "Locked", "AllowBlankDate", "AllowLostFocus",
-                                               "Text", "DateStyle", "Enabled", "ShowCalendar", "CalendarPosition",
-                                               "hWnd", "SelStart", "Sellength", "SelText"}));
-}
-
 }  // namespace
 }  // namespace kel
