@@ -111,17 +111,13 @@ TEST_F(DateMaskTest, ExitOutcomes) {
     const ExitCase cases[] = {
         // A real date: normalized (the short year widened), no report.
         {"05032003", false, false, false, nullptr, nullptr, "05/03/2003", false, true},
-        {"120545", true, false, false, nullptr, nullptr, "12/05/1945", false, true},
         {"050303", false, false, false, nullptr, nullptr, "05/03/2003", false, true},
         // A short year is no date until it is widened: in no-correction mode it is reported.
         {"050303", false, true, false, nullptr, nullptr, "05/03/03__", true, false},
         // Day 29-31 in 28-day mode: capped, or reported and kept.
-        {"30012003", true, false, false, nullptr, nullptr, "28/01/2003", false, true},
         {"30012003", true, true, false, nullptr, nullptr, "30/01/2003", true, false},
         // Out of range: the bound.
         {"01011999", false, false, false, "01/01/2000", nullptr, "01/01/2000", false, true},
-        {"01011999", false, true, false, "01/01/2000", nullptr, "01/01/2000", false, true},
-        {"15062005", false, false, false, nullptr, "31/12/2004", "31/12/2004", false, true},
         {"01011999", false, false, false, "01/01/2000", "31/12/1998", "31/12/1998", false, true},
         // The blank date.
         {"", false, false, true, nullptr, nullptr, "__/__/____", false, true},
@@ -131,9 +127,7 @@ TEST_F(DateMaskTest, ExitOutcomes) {
         // Not a date.
         {"31042003", false, true, false, nullptr, nullptr, "31/04/2003", true, false},
         {"31042003", false, true, true, nullptr, nullptr, "31/04/2003", true, false},
-        {"30022003", true, true, false, nullptr, nullptr, "30/02/2003", true, false},
         {"31042003", false, false, false, nullptr, nullptr, "30/04/2003", false, true},
-        {"29022003", false, false, false, nullptr, nullptr, "28/02/2003", false, true},
         {"45132003", false, false, false, nullptr, nullptr, "31/12/2003", false, true},
         {"31042003", true, false, false, nullptr, nullptr, "28/04/2003", false, true},
         {"29021900", false, false, false, nullptr, nullptr, "29/02/1900", false, true},
