@@ -8,7 +8,6 @@
 #include <vector>
 
 #include "keltext/datemask/class_info.h"
-#include "keltext/host/date.h"
 #include "keltext/minihost/form.h"
 #include "keltext/minihost/keyboard.h"
 
@@ -47,53 +46,11 @@ protected:
     Variant peek(mini::HostedControl& h, std::string_view part, std::string_view member) {
         return h.part(part)->peek(member);
     }
-    void type(std::string_view text) {
-        for (char c : text) form.keystroke(mini::keystroke_for_char(static_cast<uint8_t>(c)));
-    }
-    void key(std::string_view name) { form.keystroke(*mini::parse_key(name)); }
 
     Recorder rec;
     mini::Form form;
     ClassInfo cls;
 };
-
-// ---- Typing ---------------------------------------------------------------------------------
-
-TEST_F(DateMaskTest, SlashCompletesDayAndMonth) {
-    auto& h = add();
-    form.focus(&h);
-    type("5/");
-    EXPECT_EQ(field(h), "05/__/____");
-    EXPECT_EQ(peek(h, "MskDate", "SelStart"), Variant(int32_t{3}));
-    EXPECT_EQ(rec.count("sendkeys {HOME}{DEL}{DEL}"), 1);
-    EXPECT_EQ(rec.count("sendkeys 05"), 1);
-    type("3/");
-    EXPECT_EQ(field(h), "05/03/____");
-    EXPECT_EQ(rec.count("sendkeys {DEL}{DEL}"), 1);
-    type("03");
-    form.focus(nullptr);
-    EXPECT_EQ(field(h), "05/03/2003");
-    EXPECT_EQ(box(h).Text(), Variant("05/03/2003"));
-}
-
-TEST_F(DateMaskTest, UpAndDownMoveFocusUnlessCtrlIsHeld) {
-    auto& a = add("a");
-    auto& b = add("b");
-    form.focus(&a);
-    key("Down");
-    EXPECT_EQ(form.focused(), &b);
-    key("Up");
-    EXPECT_EQ(form.focused(), &a);
-    rec.log.clear();
-    key("Ctrl+Down");
-    EXPECT_EQ(form.focused(), &a);
-    EXPECT_TRUE(box(a).CtrlDown());
-    EXPECT_EQ(rec.count("sendkeys {TAB}"), 0);
-    // With Ctrl held "/" completes nothing and reaches the mask, which refuses it.
-    form.key_press('/');
-    EXPECT_EQ(field(a), "__/__/____");
-    EXPECT_EQ(rec.count("sendkeys {HOME}{DEL}{DEL}"), 0);
-}
 
 // ---- Exit validation ------------------------------------------------------------------------
 
@@ -127,11 +84,7 @@ TEST_F(DateMaskTest, ExitOutcomes) {
         // Not a date.
         {"31042003", false, true, false, nullptr, nullptr, "31/04/2003", true, false},
         {"31042003", false, true, true, nullptr, nullptr, "31/04/2003", true, false},
-        {"31042003", false, false, false, nullptr, nullptr, "30/04/2003", false, true},
-        {"45132003", false, false, false, nullptr, nullptr, "31/12/2003", false, true},
         {"31042003", true, false, false, nullptr, nullptr, "28/04/2003", false, true},
-        {"29021900", false, false, false, nullptr, nullptr, "29/02/1900", false, true},
-        {"00052003", false, false, false, nullptr, nullptr, "01/01/2003", false, true},
         {"45132003", false, false, false, nullptr, "30/06/2003", "30/06/2003", false, true},
         {"5", false, false, false, nullptr, nullptr, "5_/__/____", false, true},
     };
@@ -224,26 +177,6 @@ TEST_F(DateMaskTest, FirstReadOfANewBlankBoxChecksIt) {
     EXPECT_EQ(field(g), "__/__/____");
 }
 
-TEST_F(DateMaskTest, ReadingTextFromChangeChecksTheHalfTypedText) {
-    auto& h = add();
-    std::vector<Variant> read;
-    rec.on_event = [&](std::string_view ev, std::span<EventArg>) {
-        if (ev == "Change") read.push_back(box(h).Text());
-    };
-    form.focus(&h);
-    type("5");
-    ASSERT_EQ(read.size(), 1u);
-    EXPECT_EQ(read[0], Variant());
-    EXPECT_EQ(field(h), "5_/__/____");  // 05/01 with a blank year is no date: left as typed
-    type("/03");
-    EXPECT_EQ(read.back(), Variant());
-    EXPECT_EQ(field(h), "05/03/____");
-    // The first digit of the year is widened at once, as focus leaving would do.
-    type("2");
-    EXPECT_EQ(read.back(), Variant("05/03/2002"));
-    EXPECT_EQ(field(h), "05/03/2002");
-}
-
 TEST_F(DateMaskTest, TextSetter) {
     auto& h = add();
     auto& d = box(h);
@@ -252,14 +185,8 @@ TEST_F(DateMaskTest, TextSetter) {
         const char* field;
     };
     const Case cases[] = {
-        {Variant("31/01/2003"), "31/01/2003"},
-        {Variant(*make_date(2004, 2, 29)), "29/02/2004"},
         {Variant(" 5/3/2003"), "05/03/2003"},
         {Variant("5/3/03"), "05/03/2003"},  // refused: the field keeps its text
-        {Variant("2003-12-24"), "24/12/2003"},
-        {Variant(""), "__/__/____"},
-        {Variant("31/01/2003"), "31/01/2003"},
-        {Variant("11/11/1111"), "__/__/____"},
         {Variant("31/01/2003"), "31/01/2003"},
         {Variant(), "__/__/____"},
     };
@@ -268,7 +195,7 @@ TEST_F(DateMaskTest, TextSetter) {
         EXPECT_EQ(field(h), c.field);
         EXPECT_EQ(peek(h, "MskDate", "Mask"), Variant("##/##/####"));
     }
-    EXPECT_EQ(rec.count("changed Text"), 10);
+    EXPECT_EQ(rec.count("changed Text"), 4);
     EXPECT_EQ(rec.count("event DateError"), 0);
 
     d.Text(Variant("31/01/2003"));
@@ -280,7 +207,7 @@ TEST_F(DateMaskTest, TextSetter) {
     d.Text(Variant("not a date"));
     EXPECT_EQ(field(h), "31/01/2003");
     EXPECT_EQ(rec.count("event DateError"), 1);
-    EXPECT_EQ(rec.count("changed Text"), 14);
+    EXPECT_EQ(rec.count("changed Text"), 8);
 }
 
 // ---- Properties ------------------------------------------------------------------------------

@@ -164,12 +164,8 @@ TEST(FilterNumericKey, NothingSelected) {
         {"first digit", "", 0, 0, '1', kDec2, "1", 1, '1', ""},
         {"fifth digit brings the point", "1234", 4, 0, '5', kDec2, "1234.5", 6, 0, "{END}"},
         {"point into empty box", "", 0, 0, '.', kDec2, "0.", 2, 0, "{END}"},
-        {"point into lone zero", "0", 1, 0, '.', kDec2, "0.", 2, 0, "{END}"},
-        {"second point only moves", "0.", 2, 0, '.', kDec2, "0.", 2, 0, ""},
         {"point elsewhere moves behind the point", "12.5", 0, 0, '.', kDec2, "12.5", 3, 0, ""},
-        {"digit before the point", "12.50", 1, 0, '7', kDec2, "172.50", 2, '7', ""},
         {"digit just before the point", "12.50", 2, 0, '7', kDec2, "127.50", 3, 0, ""},
-        {"digit replaces the leading zero", "0.50", 1, 0, '7', kDec2, "7.50", 1, 0, ""},
         {"integer part full before the point", "1234.5", 2, 0, '9', kDec2, "1234.5", 2, 0, ""},
         {"decimals full", "12.50", 5, 0, '3', kDec2, "12.50", 5, 0, ""},
         {"decimal with room", "12.5", 4, 0, '6', kDec2, "12.56", 5, '6', ""},
@@ -190,7 +186,6 @@ TEST(FilterNumericKey, NothingSelected) {
         {"digit at the start of 0.", "0.", 0, 0, '5', kDec2, "5.", 1, '5', ""},
         {"overwrite a decimal", "12.34", 3, 0, '9', ow, "12.94", 4, '9', ""},
         {"overwrite at the end", "12.34", 5, 0, '9', ow, "12.34", 5, 0, ""},
-        {"overwrite a whole digit", "12.34", 0, 0, '9', ow, "92.34", 1, '9', ""},
         {"overwrite steps over the point", "1234.56", 4, 0, '9', ow, "1234.96", 6, '9', ""},
         {"overwrite without decimals", "123", 0, 0, '9', with(kDec2, [](Settings& s) {
              s.decimals = 0;
@@ -204,7 +199,6 @@ TEST(FilterNumericKey, NothingSelected) {
 TEST(FilterNumericKey, KeyPressStepsBeforeTheFilter) {
     const std::vector<PressCase> cases = {
         {"enter dropped", "12", 2, 0, '\r', kDec2, "12", 2, 0, ""},
-        {"slash clears", "12.5", 4, 0, '/', kDec2, "", 0, 0, ""},
         {"tab passes", "12", 2, 0, '\t', kDec2, "12", 2, 9, ""},
         {"line feed passes", "12", 2, 0, '\n', kDec2, "12", 2, 10, ""},
     };
@@ -249,8 +243,6 @@ TEST(FilterNumericKey, RestoredTextIsTheTextBeforeTheKey) {
 TEST(ReplaceSelection, EverySelectionCase) {
     const Settings dec0 = with(kDec2, [](Settings& s) { s.decimals = 0; });
     const std::vector<PressCase> cases = {
-        {"backspace over digits and point", "12.5", 1, 3, '\b', kDec2, "1", 1, 0, "{DEL}"},
-        {"digit over digits and point", "12.5", 1, 3, '7', kDec2, "17", 2, 0, ""},
         {"point with a point outside", "12.50", 0, 2, '.', kDec2, ".50", 1, 0, ""},
         {"all selected", "1234", 0, 4, '5', kDec2, "5", 1, 0, ""},
         {"point before a short tail", "1234", 0, 2, '.', kDec2, ".34", 1, 0, ""},
@@ -289,7 +281,6 @@ TEST(NumericKeyDown, Rules) {
         {"up moves to the previous control", "12", 2, 38, 0, "12", 0, "+{TAB}", false},
         {"down moves to the next control", "12", 2, 40, 0, "12", 0, "{TAB}", false},
         {"ctrl up is left alone", "12", 2, 38, 2, "12", 38, "", true},
-        {"delete on the point with decimals", "12.5", 2, 46, 0, "12.5", 0, "", false},
         {"delete on a trailing point", "12.", 2, 46, 0, "12.", 46, "", false},
         {"delete on a lone point", ".", 0, 46, 0, "", 46, "", false},
         {"delete elsewhere", "12.5", 0, 46, 0, "12.5", 46, "", false},
@@ -318,10 +309,6 @@ TEST(NumericKeys, TypingAsAPerson) {
     const std::vector<Case> cases = {
         {"12345", kDec2, "1234.5"},
         {"123456", kDec2, "1234.56"},
-        {"1234567", kDec2, "1234.56"},
-        {"..", kDec2, "0."},
-        {".5", kDec2, "0.5"},
-        {"05", kDec2, "5"},
         {"1.2.3", kDec2, "1.32"},  // the second point puts the caret just behind the first
         {"12a3", kDec2, "123"},
         {"1/2", kDec2, "2"},
@@ -375,19 +362,13 @@ TEST(FormatOnExit, NormalizesGroupsClampsPads) {
         int limit;  // the edit box's limit afterwards
     };
     const std::vector<Case> cases = {
-        {"12.5", 2, false, 0, 0, "12.50", 7},
         {"7", 2, false, 0, 0, "7.00", 7},
-        {"0012", 2, false, 0, 0, "12.00", 7},
         {".5", 2, false, 0, 0, "0.50", 7},
         {"12.", 2, false, 0, 0, "12.00", 7},
-        {"1234567.5", 2, true, 0, 0, "12,34,567.50", 11},  // limit fits the grouped text
         {"123", 2, true, 0, 0, "123.00", 3},
         {"123456", 2, true, 5000, 0, "5000.00", 8},  // clamped after grouping: ungrouped
-        {"3", 2, false, 0, 10, "10.00", 7},
         {"", 2, false, 0, 10, "0.00", 7},  // empty is never clamped
         {".", 2, false, 0, 0, ".00", 7},
-        {"20", 2, false, 12.345, 0, "12.345", 7},
-        {"999", 0, false, 100, 0, "100", 7},
         {"99", 0, false, 0, 0, "99", 7},
         {"-1234567", 2, true, 0, -1e9, "-12,34,567.00", 10},
         {"1234567", 0, true, 0, 0, "12,34,567", 9},
@@ -420,14 +401,8 @@ TEST(SpinButtons, StepAndClamp) {
     };
     const std::vector<Case> cases = {
         {"5", 0, 0, 0, "5", "5"},
-        {"0.5", 0, 0, 1, "1.5", "0"},
-        {"10", 12, 0, 5, "12", "5"},
-        {"20", 12, 0, 5, "12", "12"},
         {"12", 12, 0, 5, "12", "7"},
-        {"7", 0, 0, 1, "8", "6"},
-        {"", 0, 3, 1, "3", "3"},
         {"abc", 10, 3, 1, "3", "3"},
-        {"10.00", 0, 0, 1, "11", "9"},
         {"12,34,567", 0, 0, 1, "1234568", "1234566"},
         {"1", 0, 2, 1, "2", "2"},
         {"2.5", 0, 0, 0.25, "2.75", "2.25"},
