@@ -159,12 +159,5 @@ TEST(ComboFilter, StaleCaretStaysInsideTheText) {
     EXPECT_EQ(title_case_edit("ab", -3, 0, false, 'x'), "Xab");
 }
 
-TEST(ComboFilter, TrailingSpaces) {
-    EXPECT_EQ(length_without_trailing_spaces("Cash  "), 4);
-    EXPECT_EQ(length_without_trailing_spaces(" a b "), 4);
-    EXPECT_EQ(length_without_trailing_spaces("   "), 0);
-    EXPECT_EQ(length_without_trailing_spaces(""), 0);
-}
-
 }  // namespace
 }  // namespace kel

@@ -120,34 +120,16 @@ TEST(PlainNumberText, Doubles) {
         const char* expected;
     };
     const Case cases[] = {
-        {12.5, "12.5"},
-        {0.5, "0.5"},
-        {7, "7"},
-        {-3, "-3"},
-        {0, "0"},
-        {-0.0, "0"},
-        {-0.25, "-0.25"},
-        {0.1 + 0.2, "0.3"},
-        {1.0 / 3, "0.333333333333333"},
-        {2.0 / 3, "0.666666666666667"},
-        {999999999999999, "999999999999999"},
-        {1e15, "1E+15"},
-        {-1e15, "-1E+15"},
-        {1.5e16, "1.5E+16"},
+        {12.5, "12.5"}, {0.5, "0.5"}, {7, "7"}, {-3, "-3"}, {0, "0"}, {-0.0, "0"}, {-0.25, "-0.25"},
+        {0.1 + 0.2, "0.3"}, {1.0 / 3, "0.333333333333333"}, {2.0 / 3, "0.666666666666667"},
+        {999999999999999, "999999999999999"}, {1e15, "1E+15"}, {-1e15, "-1E+15"}, {1.5e16, "1.5E+16"},
         {9999999999999999.0, "1E+16"},  // rounds up to 16 digits
-        {123456789012345678.0, "1.23456789012346E+17"},
-        {1e100, "1E+100"},
-        {DBL_MAX, "1.79769313486232E+308"},
+        {123456789012345678.0, "1.23456789012346E+17"}, {1e100, "1E+100"}, {DBL_MAX, "1.79769313486232E+308"},
         {0.00001, "0.00001"},
         {0.012345678901234, "0.012345678901234"},  // exactly 15 decimals
         {0.0123456789012345, "1.23456789012345E-02"},  // 16 decimals
-        {0.0199999997764826, "1.99999997764826E-02"},
-        {1e-20, "1E-20"},
-        {-1.5e-20, "-1.5E-20"},
-        {1234.5, "1234.5"},
-        {100, "100"},
-        {123456789012345.6, "123456789012346"},
-        {1e14 + 0.75, "100000000000001"},
+        {0.0199999997764826, "1.99999997764826E-02"}, {1e-20, "1E-20"}, {-1.5e-20, "-1.5E-20"}, {1234.5, "1234.5"},
+        {100, "100"}, {123456789012345.6, "123456789012346"}, {1e14 + 0.75, "100000000000001"},
         {4.94065645841247e-324, "4.94065645841247E-324"},
     };
     for (const auto& c : cases) EXPECT_EQ(plain_number_text(c.value), c.expected) << c.expected;
@@ -219,30 +201,14 @@ TEST(WholeConversions, RangesAndRounding) {
     };
     constexpr int kOv = -100006;
     const Case cases[] = {
-        {0, 0, 0, 0},
-        {255, 255, 255, 255},
-        {255.5, kOv, 256, 256},
-        {256, kOv, 256, 256},
-        {-0.5, 0, 0, 0},
-        {-0.6, kOv, -1, -1},
-        {2.5, 2, 2, 2},
-        {3.5, 4, 4, 4},
-        {32767, kOv, 32767, 32767},
-        {32767.5, kOv, kOv, 32768},
-        {32768, kOv, kOv, 32768},
-        {-32768, kOv, -32768, -32768},
-        {-32768.5, kOv, -32768, -32768},
-        {-32768.6, kOv, kOv, -32769},
-        {-32769, kOv, kOv, -32769},
-        {2147483647, kOv, kOv, 2147483647},
-        {2147483647.5, kOv, kOv, kOv},
-        {2147483648.0, kOv, kOv, kOv},
-        {-2147483648.0, kOv, kOv, -2147483647 - 1},
-        {-2147483648.5, kOv, kOv, -2147483647 - 1},
-        {-2147483649.0, kOv, kOv, kOv},
+        {0, 0, 0, 0}, {255, 255, 255, 255}, {255.5, kOv, 256, 256}, {256, kOv, 256, 256}, {-0.5, 0, 0, 0},
+        {-0.6, kOv, -1, -1}, {2.5, 2, 2, 2}, {3.5, 4, 4, 4}, {32767, kOv, 32767, 32767}, {32767.5, kOv, kOv, 32768},
+        {32768, kOv, kOv, 32768}, {-32768, kOv, -32768, -32768}, {-32768.5, kOv, -32768, -32768},
+        {-32768.6, kOv, kOv, -32769}, {-32769, kOv, kOv, -32769}, {2147483647, kOv, kOv, 2147483647},
+        {2147483647.5, kOv, kOv, kOv}, {2147483648.0, kOv, kOv, kOv}, {-2147483648.0, kOv, kOv, -2147483647 - 1},
+        {-2147483648.5, kOv, kOv, -2147483647 - 1}, {-2147483649.0, kOv, kOv, kOv},
         {std::numeric_limits<double>::quiet_NaN(), kOv, kOv, kOv},
-        {std::numeric_limits<double>::infinity(), kOv, kOv, kOv},
-        {1e300, kOv, kOv, kOv},
+        {std::numeric_limits<double>::infinity(), kOv, kOv, kOv}, {1e300, kOv, kOv, kOv},
     };
     auto run = [](auto f) -> int {
         try {
@@ -266,38 +232,19 @@ TEST(WholeConversions, FromVariantKinds) {
         int expected;  // the 16-bit result, or the error number negated
     };
     const Case cases[] = {
-        {Variant(), 0},
-        {Variant(true), -1},
-        {Variant(false), 0},
+        {Variant(), 0}, {Variant(true), -1}, {Variant(false), 0},
         {Variant(Date{36526}), -6},  // a date converts as its day count
-        {Variant(Date{100}), 100},
-        {Variant(uint8_t{200}), 200},
-        {Variant(int32_t{40000}), -6},
-        {Variant(2.5f), 2},
-        {Variant("12"), 12},
-        {Variant(" 12 "), 12},
-        {Variant("1,234"), 1234},
-        {Variant("2.5"), 2},
-        {Variant("-3.5"), -4},
-        {Variant("&H1F"), 31},
+        {Variant(Date{100}), 100}, {Variant(uint8_t{200}), 200}, {Variant(int32_t{40000}), -6}, {Variant(2.5f), 2},
+        {Variant("12"), 12}, {Variant(" 12 "), 12}, {Variant("1,234"), 1234}, {Variant("2.5"), 2},
+        {Variant("-3.5"), -4}, {Variant("&H1F"), 31},
         {Variant("&HFFFF"), -6},  // hexadecimal text is its unsigned value
-        {Variant("1e3"), 1000},
-        {Variant("1e999"), -6},
-        {Variant("40000"), -6},
-        {Variant(""), -13},
-        {Variant(" "), -13},
-        {Variant("abc"), -13},
-        {Variant("12abc"), -13},
-        {Variant("1.2.3"), -13},
+        {Variant("1e3"), 1000}, {Variant("1e999"), -6}, {Variant("40000"), -6}, {Variant(""), -13},
+        {Variant(" "), -13}, {Variant("abc"), -13}, {Variant("12abc"), -13}, {Variant("1.2.3"), -13},
         {Variant(std::make_shared<Object>()), -13},
     };
     for (const auto& c : cases) {
         int got = 0;
-        try {
-            got = to_int16(c.value);
-        } catch (const RuntimeError& e) {
-            got = -e.number();
-        }
+        if (const int error = error_of([&] { got = to_int16(c.value); })) got = -error;
         EXPECT_EQ(got, c.expected) << text_of(c.value.is_object() ? Variant("object") : c.value);
     }
 }
@@ -331,11 +278,7 @@ TEST(ToBool, ByKindAndText) {
     };
     for (const auto& c : cases) {
         int got = 0;
-        try {
-            got = to_bool(c.value) ? 1 : 0;
-        } catch (const RuntimeError& e) {
-            got = -e.number();
-        }
+        if (const int error = error_of([&] { got = to_bool(c.value) ? 1 : 0; })) got = -error;
         EXPECT_EQ(got, c.expected) << c.value.str();
     }
 }

@@ -66,37 +66,8 @@ protected:
     std::unique_ptr<TerminalSession> session;
 };
 
-TEST_F(SessionTest, APersonFillsInTheVoucherAndFinishes) {
-    EXPECT_EQ(focused(), "Payee");
-    EXPECT_NE(row(kDateRow).find("06/12/2026"), std::string::npos) << "the form starts the date at today";
-    type(U"ramesh kumar");
-    tab();
-    type(U"abcde1234f");
-    tab();
-    type(U"1234567.5");
-    tab();
-    EXPECT_NE(row(kAmountRow).find("12,34,567.50"), std::string::npos) << row(kAmountRow);
-    type(U"31042026");
-    tab();
-    EXPECT_NE(row(kDateRow).find("30/04/2026"), std::string::npos) << row(kDateRow);
-    type(U"ch");
-    EXPECT_NE(row(kPayModeRow).find("Cheque"), std::string::npos) << row(kPayModeRow);
-    tab();
-    type(U"123456");
-    tab();
-    type(U"0526");
-    EXPECT_EQ(key(kF10), TerminalSession::Outcome::finished);
-    EXPECT_EQ(session->values_json(),
-              "{\n"
-              "  \"Payee\": \"Ramesh Kumar\",\n"
-              "  \"PAN\": \"ABCDE1234F\",\n"
-              "  \"Amount\": 1234567.5,\n"
-              "  \"VoucherDate\": \"30/04/2026\",\n"
-              "  \"PayMode\": \"Cheque\",\n"
-              "  \"ChequeNo\": \"123456\",\n"
-              "  \"Period\": \"05/26 \"\n"
-              "}");
-}
+// tui_tmux.sh fills in every field of the voucher in a real terminal, opens the combo list and
+// the calendar with F4 and checks the JSON printed; these cases take what it leaves out.
 
 TEST_F(SessionTest, TheVoucherDateStaysInTheFinancialYear) {
     tab(3);
@@ -110,16 +81,12 @@ TEST_F(SessionTest, TheVoucherDateStaysInTheFinancialYear) {
     EXPECT_EQ(text("VoucherDate"), Variant("31/03/2027"));
 }
 
-TEST_F(SessionTest, TheComboListOpensWithF4OrAltDown) {
+TEST_F(SessionTest, TheComboListOpensWithAltDownAndEscapeOnlyClosesIt) {
     tab(4);
     ASSERT_EQ(focused(), "PayMode");
-    key(kF4);
+    key(mini::kVkDown, kAltMask);
     ASSERT_TRUE(session->list_open());
     EXPECT_TRUE(logged("event PayMode.DropDown"));
-    Canvas c = screen();
-    std::string shown;
-    for (int r = kPayModeRow + 1; r < kPayModeRow + 7; ++r) shown += c.row_text(r) + "\n";
-    for (const char* entry : {"Cash", "Cheque", "Card", "UPI"}) EXPECT_NE(shown.find(entry), std::string::npos) << shown;
     key(mini::kVkDown);
     key(mini::kVkDown);
     key(mini::kVkEnter);
@@ -127,7 +94,7 @@ TEST_F(SessionTest, TheComboListOpensWithF4OrAltDown) {
     EXPECT_EQ(text("PayMode"), Variant("Card"));
     EXPECT_EQ(form.find("PayMode")->dispatch().get("ListIndex"), Variant(int16_t{2}));
 
-    key(mini::kVkDown, kAltMask);
+    key(kF4);
     ASSERT_TRUE(session->list_open());
     key(mini::kVkUp);
     key(mini::kVkEscape);  // closes the list only

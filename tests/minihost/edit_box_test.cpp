@@ -31,17 +31,15 @@ TEST(EditBox, EditsByThePerson) {
         {"high characters are typed", "", 0, 0, 0, {"press:201"}, "\xC9", 1, 0, 1},
         {"codes past a byte insert nothing", "", 0, 0, 0, {"press:300", "press:-5"}, "", 0, 0, 0},
         {"backspace deletes before the caret", "abc", 2, 0, 0, {"press:8"}, "ac", 1, 0, 1},
-        {"backspace deletes the selection", "abcd", 1, 2, 0, {"press:8"}, "ad", 1, 0, 1},
         {"backspace at the start does nothing", "abc", 0, 0, 0, {"press:8"}, "abc", 0, 0, 0},
         {"delete removes after the caret", "abc", 1, 0, 0, {"down:46"}, "ac", 1, 0, 1},
         {"delete removes the selection", "abcd", 0, 3, 0, {"down:46"}, "d", 0, 0, 1},
         {"delete at the end does nothing", "abc", 3, 0, 0, {"down:46"}, "abc", 3, 0, 0},
         {"left moves one back", "abc", 2, 0, 0, {"down:37"}, "abc", 1, 0, 0},
-        {"left at the start stays", "abc", 0, 0, 0, {"down:37"}, "abc", 0, 0, 0},
         {"left with a selection goes to its start", "abcd", 1, 2, 0, {"down:37"}, "abcd", 1, 0, 0},
         {"right with a selection goes to its end", "abcd", 1, 2, 0, {"down:39"}, "abcd", 3, 0, 0},
         {"right at the end stays", "ab", 2, 0, 0, {"down:39"}, "ab", 2, 0, 0},
-        {"home and end", "abcd", 2, 1, 0, {"down:36"}, "abcd", 0, 0, 0},
+        {"home", "abcd", 2, 1, 0, {"down:36"}, "abcd", 0, 0, 0},
         {"end", "abcd", 0, 2, 0, {"down:35"}, "abcd", 4, 0, 0},
         {"paste replaces the selection", "abcd", 1, 2, 0, {"paste:XYZ"}, "aXYZd", 4, 0, 1},
         {"paste is cut to the limit", "abc", 1, 0, 5, {"paste:WXYZ"}, "aWXbc", 3, 0, 1},
@@ -141,24 +139,9 @@ TEST(EditBox, ProgramSettersAndTheirErrors) {
     EXPECT_EQ(box.Width(), 1000.0f);
 }
 
-TEST(EditBox, PeekKinds) {
+TEST(EditBox, MembersByNameAndTheirErrors) {
     RecordingContext ctx;
     MiniEditBox box(ctx, "txt", 77, 1000, 300);
-    struct {
-        const char* member;
-        VarKind kind;
-    } const kinds[] = {
-        {"Left", VarKind::Single},      {"Width", VarKind::Single},    {"SelStart", VarKind::Int32},
-        {"SelLength", VarKind::Int32},  {"MaxLength", VarKind::Int32}, {"hWnd", VarKind::Int32},
-        {"ForeColor", VarKind::Int32},  {"BackColor", VarKind::Int32}, {"Text", VarKind::String},
-        {"SelText", VarKind::String},   {"Enabled", VarKind::Boolean}, {"Visible", VarKind::Boolean},
-        {"Font", VarKind::Object},
-    };
-    for (const auto& k : kinds) {
-        SCOPED_TRACE(k.member);
-        EXPECT_EQ(box.peek(k.member).kind(), k.kind);
-        EXPECT_TRUE(find_member(box, k.member).has_value());
-    }
     EXPECT_EQ(box.peek("hwnd"), Variant(int32_t{77}));
     EXPECT_EQ(font_of(box.peek("Font"))->name, "Fixedsys");
     EXPECT_EQ(*find_member(box, "selstart"), "SelStart");

@@ -401,19 +401,6 @@ TEST(Form, ClicksAreNotDeliveredToADisabledSurfaceOrWidget) {
     EXPECT_EQ(r.take(), (Lines{"a.Click"}));
 }
 
-TEST(Form, InsertKeyState) {
-    Form f;
-    HostedControl& a = f.create(probe_class(), "a");
-    Keyboard& kb = probe(a).site().keyboard();
-    EXPECT_EQ(kb.key_state(kVkInsert), 0);
-    f.set_insert(true);
-    EXPECT_EQ(kb.key_state(kVkInsert), 1);
-    EXPECT_EQ(kb.key_state(kVkNumLock), 0);
-    f.focus(&a);
-    f.keystroke(*parse_key("Insert"));
-    EXPECT_FALSE(f.insert_on());
-}
-
 TEST(Form, PagesEditTheSelectedControl) {
     Recorder r;
     Form f(&r);

@@ -11,23 +11,12 @@ TEST(PropertyStore, EqualityAcrossKinds) {
         bool equal;
     };
     const Case cases[] = {
-        {int16_t{5}, int32_t{5}, true},
-        {int16_t{5}, 5.0, true},
-        {uint8_t{0}, false, true},
-        {int16_t{-1}, true, true},
-        {int32_t{1}, true, false},
-        {Variant(), int16_t{0}, true},
-        {Variant(), false, true},
-        {Variant(), "", true},
-        {"", Variant(), true},
-        {Variant(), "0", false},
-        {"abc", "abc", true},
-        {"abc", "ABC", false},
-        {"5", int16_t{5}, false},
-        {0.5f, 0.5, true},
-        {0.1f, 0.1, false},  // a single is not the double nearest 0.1
-        {Date{10}, Date{10}, true},
-        {Date{10}, int32_t{10}, false},
+        {int16_t{5}, int32_t{5}, true}, {int16_t{5}, 5.0, true},     {uint8_t{0}, false, true},
+        {int16_t{-1}, true, true},      {int32_t{1}, true, false},   {Variant(), int16_t{0}, true},
+        {Variant(), false, true},       {Variant(), "", true},       {Variant(), "0", false},
+        {"abc", "abc", true},           {"abc", "ABC", false},       {"5", int16_t{5}, false},
+        {0.5f, 0.5, true},              {0.1f, 0.1, false},  // a single is not the double nearest 0.1
+        {Date{10}, Date{10}, true},     {Date{10}, int32_t{10}, false},
     };
     for (const auto& c : cases) {
         SCOPED_TRACE(testing::Message() << kind_name(c.a.kind()) << " vs " << kind_name(c.b.kind()));
