@@ -13,6 +13,7 @@
 #include "keltext/host/font.h"
 #include "keltext/minihost/form.h"
 #include "keltext/minihost/keyboard.h"
+#include "tests/support/form_recorder.h"
 
 namespace kel {
 namespace {
@@ -20,29 +21,7 @@ namespace {
 using mini::Form;
 using mini::HostedControl;
 
-// Records what the control tells the form; `on_event` plays the form's code.
-struct Recorder : mini::FormObserver {
-    std::vector<std::string> events;
-    std::vector<std::string> changed;
-    std::vector<std::string> errors;
-    std::function<void(std::string_view, std::span<EventArg>)> on_event;
-
-    void event_raised(HostedControl&, int number, std::string_view event, std::span<EventArg> args) override {
-        std::string line = std::to_string(number) + " " + std::string(event);
-        for (const EventArg& a : args) line += " " + std::string(a.name) + "=" + std::to_string(static_cast<long long>(a.value.number()));
-        events.push_back(line);
-        if (on_event) on_event(event, args);
-    }
-    void property_changed(HostedControl&, std::string_view p) override { changed.emplace_back(p); }
-    void handler_error(std::string_view where, int number) override {
-        errors.push_back(std::string(where) + " " + std::to_string(number));
-    }
-    bool saw(std::string_view event) const {
-        for (const auto& e : events)
-            if (e.find(event) != std::string::npos) return true;
-        return false;
-    }
-};
+using Recorder = testing_support::FormRecorder;
 
 class AlphaTest : public ::testing::Test {
 protected:

@@ -13,6 +13,7 @@
 #include "keltext/host/font.h"
 #include "keltext/minihost/form.h"
 #include "keltext/minihost/keyboard.h"
+#include "tests/support/form_recorder.h"
 
 namespace kel {
 namespace {
@@ -20,23 +21,7 @@ namespace {
 using mini::Form;
 using mini::HostedControl;
 
-struct Recorder : mini::FormObserver {
-    std::vector<std::string> events;
-    std::vector<std::string> changed;
-    std::vector<std::string> errors;
-    std::function<void(std::string_view, std::span<EventArg>)> on_event;
-
-    void event_raised(HostedControl&, int number, std::string_view event, std::span<EventArg> args) override {
-        std::string line = std::to_string(number) + " " + std::string(event);
-        for (const EventArg& a : args) line += " " + std::to_string(static_cast<long long>(a.value.number()));
-        events.push_back(line);
-        if (on_event) on_event(event, args);
-    }
-    void property_changed(HostedControl&, std::string_view p) override { changed.emplace_back(p); }
-    void handler_error(std::string_view where, int number) override {
-        errors.push_back(std::string(where) + " " + std::to_string(number));
-    }
-};
+using Recorder = testing_support::FormRecorder;
 
 std::string L(std::string s) {
     for (auto [mark, code] : {std::pair{"[200]", '\xC8'}, std::pair{"[201]", '\xC9'}})
