@@ -98,7 +98,8 @@ Date financial_year_end(Date day);
 void open_form(mini::Form& form, const SavedForm& saved, std::span<const ClassInfo> classes, const std::string& file,
                Date today);
 
-// Today's date on this machine's clock, in local time.
+// Today's date on this machine's clock, in local time, or the date yyyy-mm-dd that the
+// environment variable KELFORM_TODAY fixes (FormFileError when it is no date).
 Date local_today();
 
 // The saved form with each control's stored values replaced by what WriteProperties stores now.

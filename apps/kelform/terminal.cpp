@@ -35,10 +35,11 @@ int run_terminal(int argc, char** argv) {
     // reported on a plain terminal.
     Catalogue catalogue;
     const std::string name = path ? *path : std::string(kDemoFormName);
-    const Date today = local_today();
+    Date today;
     SavedForm saved;
     mini::Form form;
     try {
+        today = local_today();
         saved = path ? read_form_file(*path, catalogue.classes())
                     : parse_form(demo_form_text(), name, catalogue.classes());
         open_form(form, saved, catalogue.classes(), name, today);

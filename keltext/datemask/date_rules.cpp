@@ -7,6 +7,7 @@
 #include "keltext/host/conversions.h"
 #include "keltext/host/date.h"
 #include "keltext/host/date_recognizer.h"
+#include "keltext/host/mask.h"
 
 namespace kel {
 namespace {
@@ -148,6 +149,35 @@ std::string PromptToBlank(std::string_view text, int32_t date_style) {
 std::string FormatDayPart(std::string_view text) { return format_part(mid(text, 1, 2), 31); }
 
 std::string FormatMonthPart(std::string_view text) { return format_part(mid(text, 4, 2), 12); }
+
+DateField DateFieldAt(int32_t caret) {
+    if (caret < 0) return DateField::none;
+    if (caret <= 2) return DateField::day;
+    if (caret <= 5) return DateField::month;
+    return DateField::year;
+}
+
+std::string BlankFieldFromCaret(std::string_view text, int32_t caret) {
+    std::string out(text);
+    // Each field ends where its separator stands: the day at 2, the month at 5, the year at 10.
+    int32_t end = 10;
+    switch (DateFieldAt(caret)) {
+    case DateField::day: end = 2; break;
+    case DateField::month: end = 5; break;
+    case DateField::year: end = 10; break;
+    case DateField::none: return out;
+    }
+    for (int32_t i = caret; i < end && i < static_cast<int32_t>(out.size()); ++i) out[static_cast<std::size_t>(i)] = ' ';
+    return out;
+}
+
+std::string BlankSelection(std::string_view text, std::string_view mask, int32_t start, int32_t length) {
+    std::string out(text);
+    const auto n = static_cast<int32_t>(std::min(out.size(), mask.size()));
+    for (int32_t i = std::max(start, 0); i < n && i - start < length; ++i)
+        if (mask_is_input(mask[static_cast<std::size_t>(i)])) out[static_cast<std::size_t>(i)] = kMaskPrompt;
+    return out;
+}
 
 bool CheckMonthYear(std::string_view text) {
     const double month = round_half_even(leading_value(mid(text, 1, 2)));

@@ -39,6 +39,21 @@ std::string FormatDayPart(std::string_view text);
 // The month field (4-5) likewise: "01".."12", or "" above 12.
 std::string FormatMonthPart(std::string_view text);
 
+// The field of style ddMMyyyy a caret position belongs to, as "/" reads it: the day up to
+// and including its separator (0-2), the month likewise (3-5), the year after that.
+enum class DateField : int8_t { none = -1, day = 0, month = 1, year = 2 };
+DateField DateFieldAt(int32_t caret);
+
+// The text "/" completes a field from when the person has typed into that field since the
+// caret entered it: what stands from the caret to the field's end is left over from before
+// (a pre-filled date typed over), so it counts as blank. Positions are 0-based here; the
+// text is the field's text with its prompts already blanks.
+std::string BlankFieldFromCaret(std::string_view text, int32_t caret);
+
+// The field's text with the input positions of a selection turned into the prompt (literals
+// stay), for typing a new value over a selected one.
+std::string BlankSelection(std::string_view text, std::string_view mask, int32_t start, int32_t length);
+
 // True when a month-year text (style mmyyA, prompts already blanks) has a month from 1 to 12
 // and a year field of two non-blank characters. The letter at 6 plays no part.
 bool CheckMonthYear(std::string_view text);

@@ -9,6 +9,7 @@
 #include "keltext/host/date.h"
 #include "keltext/host/date_recognizer.h"
 #include "keltext/host/errors.h"
+#include "keltext/host/mask.h"
 
 namespace kel {
 namespace {
@@ -330,6 +331,8 @@ void KelDateMask::fit_width_to_button() {
 // ---- Focus and validation -------------------------------------------------------------------
 
 void KelDateMask::EnterFocus() {
+    forget_typing();
+    caret_after_key_ = -1;
     const auto n = static_cast<int32_t>(MskDate.Text().size());
     if (n > 0) {
         MskDate.SelStart(0);
@@ -338,9 +341,15 @@ void KelDateMask::EnterFocus() {
     allow_lost_focus_ = true;
 }
 
-void KelDateMask::ExitFocus() { ValidateOnExit(); }
+void KelDateMask::ExitFocus() {
+    forget_typing();
+    ValidateOnExit();
+}
 
-void KelDateMask::MskDate_LostFocus() { ValidateOnExit(); }
+void KelDateMask::MskDate_LostFocus() {
+    forget_typing();
+    ValidateOnExit();
+}
 
 void KelDateMask::ValidateOnExit() {
     if (validated_) return;
@@ -405,6 +414,7 @@ void KelDateMask::raise_key_event(Event number, std::string_view name, int16_t& 
 
 void KelDateMask::MskDate_KeyDown(int16_t& key_code, int16_t& shift) {
     validated_ = false;
+    typed_at_ = -1;
     raise_key_event(kKeyDown, "KeyDown", key_code, shift);
     ctrl_down_ = (shift & 2) != 0;
     if (ctrl_down_) return;
@@ -418,28 +428,70 @@ void KelDateMask::MskDate_KeyPress(int16_t& key_ascii) {
     site_.raise_event(kKeyPress, "KeyPress", args);
     if (const auto* k = args[0].value.get_if<int16_t>()) key_ascii = *k;
 
+    const bool person = !site_.keyboard().delivering_sent_keys();
+    // A caret the person moved, or a selection they made, since their last keystroke starts
+    // the typing afresh.
+    if (person && (MskDate.SelStart() != caret_after_key_ || MskDate.SelLength() != 0)) forget_typing();
+
     if (key_ascii == kAsciiEnter) {
         key_ascii = 0;
         return;
     }
+    const bool slash = key_ascii == kAsciiSlash && !ctrl_down_ && date_style_ == ddMMyyyy;
+    if (slash && person && confirm_pending_) {
+        // The digit before it already filled the field and carried the caret on: this "/" is
+        // the clerk's separator, and the field is complete as typed.
+        confirm_pending_ = false;
+        key_ascii = 0;
+        return;
+    }
     // Typing always overwrites: the character at the caret is selected to be replaced.
-    if (key_ascii != kAsciiBackspace) MskDate.SelLength(1);
+    if (key_ascii != kAsciiBackspace) {
+        prepare_overwrite(key_ascii);
+        MskDate.SelLength(1);
+    }
     if (ctrl_down_) return;
 
     if (date_style_ == ddMMyyyy) {
         if (key_ascii == kAsciiSlash) {
-            complete_field();
+            complete_field(person && typed_field_ != DateField::none &&
+                           typed_field_ == DateFieldAt(MskDate.SelStart()));
+            forget_typing();
             key_ascii = 0;  // the separators are the mask's own
         }
     } else if (date_style_ == mmyyA) {
         if (key_ascii >= 'a' && key_ascii <= 'z') key_ascii = static_cast<int16_t>(key_ascii - ('a' - 'A'));
     }
+    if (person && key_ascii >= 32 && key_ascii <= 255) {
+        typed_at_ = first_input_position(MskDate.Mask(), MskDate.SelStart());
+        typed_char_ = static_cast<char>(static_cast<uint8_t>(key_ascii));
+    }
 }
 
-void KelDateMask::complete_field() {
-    const std::string t = PromptToBlank(MskDate.Text(), date_style_);
-    Keyboard& keys = site_.keyboard();
+void KelDateMask::prepare_overwrite(int16_t key_ascii) {
+    const int32_t start = MskDate.SelStart();
+    if (MskDate.SelLength() <= 1) return;
+    if (key_ascii == kAsciiSlash) {
+        // Over a selection "/" completes the field where the selection starts.
+        MskDate.SelStart(start);
+        return;
+    }
+    // Only a key that will type a character clears the selection: a dropped key, Escape or a
+    // Ctrl combination leaves the text as it was.
+    if (key_ascii < 32 || key_ascii > 255 || ctrl_down_) return;
+    const std::string mask = MskDate.Mask();
+    const int32_t at = first_input_position(mask, start);
+    if (at < 0 || !mask_fits(static_cast<char>(static_cast<uint8_t>(key_ascii)), mask[static_cast<std::size_t>(at)]))
+        return;
+    MskDate.Text(BlankSelection(MskDate.Text(), mask, start, MskDate.SelLength()));
+    MskDate.SelStart(start);
+}
+
+void KelDateMask::complete_field(bool typed_here) {
     const int32_t caret = MskDate.SelStart();
+    std::string t = PromptToBlank(MskDate.Text(), date_style_);
+    if (typed_here) t = BlankFieldFromCaret(t, caret);
+    Keyboard& keys = site_.keyboard();
     if (caret >= 0 && caret <= 2) {
         // The day is cleared and typed again in full by the queued keystrokes, which carry
         // the caret past the separator into the month.
@@ -462,6 +514,31 @@ void KelDateMask::complete_field() {
 void KelDateMask::MskDate_KeyUp(int16_t& key_code, int16_t& shift) {
     raise_key_event(kKeyUp, "KeyUp", key_code, shift);
     validated_ = false;
+    if (!site_.keyboard().delivering_sent_keys()) note_typing();
+    caret_after_key_ = MskDate.SelLength() == 0 ? MskDate.SelStart() : -1;
+    typed_at_ = -1;
+}
+
+void KelDateMask::note_typing() {
+    const std::string text = MskDate.Text();
+    const int32_t caret = MskDate.SelStart();
+    const bool landed = typed_at_ >= 0 && typed_at_ < static_cast<int32_t>(text.size()) &&
+                        text[static_cast<std::size_t>(typed_at_)] == typed_char_ && caret > typed_at_;
+    if (!landed || date_style_ != ddMMyyyy) {
+        // Any key that typed nothing (a caret key, Backspace, a refused or dropped key)
+        // leaves nothing for "/" to confirm or complete from.
+        forget_typing();
+        return;
+    }
+    // The last digit of the day or month carries the caret past the separator: the field is
+    // full, and the caret has entered the next one with nothing typed there yet.
+    confirm_pending_ = (typed_at_ == 1 || typed_at_ == 4) && caret == typed_at_ + 2;
+    typed_field_ = confirm_pending_ ? DateField::none : DateFieldAt(typed_at_);
+}
+
+void KelDateMask::forget_typing() {
+    typed_field_ = DateField::none;
+    confirm_pending_ = false;
 }
 
 void KelDateMask::MskDate_Change() {

@@ -113,8 +113,14 @@ private:
     // Checks the field's text once between keystrokes: completes and corrects it, or reports
     // it through DateError and AllowLostFocus.
     void ValidateOnExit();
-    // "/" typed in style ddMMyyyy: completes the day or month field the caret is in.
-    void complete_field();
+    // "/" typed in style ddMMyyyy: completes the day or month field the caret is in, from
+    // what the person typed there when `typed_here`.
+    void complete_field(bool typed_here);
+    // Typing over a selection of several characters starts the selected part afresh.
+    void prepare_overwrite(int16_t key_ascii);
+    // After a keystroke of the person's: what they typed, for the next "/".
+    void note_typing();
+    void forget_typing();
     // Writes a text the mask would not take as typed: empty mask, text, then `mask`.
     void write_unmasked(const std::string& text, const std::string& mask);
     void raise_key_event(Event number, std::string_view name, int16_t& key_code, int16_t& shift);
@@ -139,6 +145,14 @@ private:
 
     bool validated_ = false;
     bool ctrl_down_ = false;
+
+    // The person's own typing, which tells a "/" typed as a separator from one typed to
+    // complete a field. Keystrokes the control queues itself never change it.
+    DateField typed_field_ = DateField::none;  // typed into since the caret entered it
+    bool confirm_pending_ = false;  // their digit just filled the day or month: "/" only confirms
+    int32_t caret_after_key_ = -1;  // where the last keystroke left the caret; elsewhere = moved
+    int32_t typed_at_ = -1;         // where this keystroke's character is to land
+    char typed_char_ = 0;
 };
 
 }  // namespace kel

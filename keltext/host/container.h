@@ -56,6 +56,8 @@ public:
     virtual int16_t key_state(int16_t virtual_key) = 0;
     // Lets the container handle pending work before the caller goes on.
     virtual void process_pending() = 0;
+    // True while the keystroke being delivered is one that send_keys queued, not the person's.
+    virtual bool delivering_sent_keys() const = 0;
 };
 
 // One argument of a raised event. Arguments are by reference: the form's handlers may change

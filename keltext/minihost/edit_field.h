@@ -25,6 +25,7 @@ public:
         text_ = t;
         sel_start_ = 0;
         sel_length_ = 0;
+        text_changed();
         this->fire_change();
     }
     int32_t SelStart() const override { return sel_start_; }
@@ -79,6 +80,9 @@ protected:
     virtual int32_t limit() const { return 0; }
     // False where the field takes no typing (a drop-down list).
     virtual bool editable() const { return true; }
+    // The text has just changed, before Change is raised, so that the form's Change handler
+    // already sees whatever the widget derives from the text.
+    virtual void text_changed() {}
 
     // The widget's own part of a key down, after the owner's handler.
     virtual void own_key_down(int16_t key_code, int16_t /*shift*/) {
@@ -114,7 +118,9 @@ protected:
         text_.replace(start, count, piece);
         sel_start_ += static_cast<int32_t>(piece.size());
         sel_length_ = 0;
-        if (changed) this->fire_change();
+        if (!changed) return;
+        text_changed();
+        this->fire_change();
     }
 
     virtual void type_char(char c) {

@@ -30,6 +30,7 @@ public:
         return virtual_key == kVkInsert && insert_ ? 1 : 0;
     }
     int& handler_depth() override { return handler_depth_; }
+    bool delivering_sent_keys() const override { return delivering_; }
 
     MiniSite& site_of(HostedControl& c);
     MiniSite* find(std::string_view name);

@@ -93,6 +93,19 @@ void ListCore::check_selectable(int32_t index) const {
     if (index < -1 || index >= count()) raise_error(kInvalidPropertyIndex);
 }
 
+int32_t ListCore::find_exact(std::string_view text) const {
+    // An empty field is no choice, even where the list holds an entry without text.
+    if (text.empty()) return -1;
+    const auto same = [&](const Entry& e) {
+        if (e.text.size() != text.size()) return false;
+        for (std::size_t i = 0; i < text.size(); ++i)
+            if (upper_case(e.text[i]) != upper_case(text[i])) return false;
+        return true;
+    };
+    const auto it = std::find_if(entries_.begin(), entries_.end(), same);
+    return it == entries_.end() ? -1 : static_cast<int32_t>(it - entries_.begin());
+}
+
 void ListCore::sort() {
     std::vector<std::pair<Entry, bool>> tagged;
     tagged.reserve(entries_.size());

@@ -3,6 +3,7 @@
 #include <cstdint>
 #include <optional>
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include "keltext/minihost/edit_field.h"
@@ -23,6 +24,9 @@ public:
     void set_data(int32_t index, int32_t value);
     // Raises 381 unless `index` is -1 or an entry.
     void check_selectable(int32_t index) const;
+    // The first entry whose text equals `text` upper-cased as the combo's search compares,
+    // or -1 (always for the empty text).
+    int32_t find_exact(std::string_view text) const;
     void sort();  // stable, by upper-cased text; the selected entry stays selected
 
     int32_t count() const { return static_cast<int32_t>(entries_.size()); }
@@ -67,6 +71,9 @@ public:
 
 protected:
     bool editable() const override { return style_ != 2; }
+    // The selected entry follows the edit text, so that the entry a form reads through
+    // ListIndex (and its ItemData) is always the one whose text the person sees.
+    void text_changed() override { list_.list_index = list_.find_exact(text_); }
     void own_key_down(int16_t key_code, int16_t shift) override;
     void list_members(std::vector<std::string>& m) const override;
     std::optional<Variant> peek_member(std::string_view m, std::optional<int32_t> index) const override;

@@ -14,6 +14,7 @@
 // program cannot leave the box holding a text its mask does not describe.
 #include <string>
 
+#include "keltext/host/mask.h"
 #include "keltext/minihost/edit_field.h"
 
 namespace kel::mini {
@@ -22,7 +23,7 @@ class MiniMaskedEdit final : public EditFieldImpl<MaskedEdit> {
 public:
     using EditFieldImpl<MaskedEdit>::EditFieldImpl;
 
-    static constexpr char kPrompt = '_';
+    static constexpr char kPrompt = kMaskPrompt;
     static bool is_input(char mask_char);
     static bool fits(char c, char mask_char);
 

@@ -26,6 +26,7 @@ public:
     virtual int16_t key_state(int16_t virtual_key) const = 0;
     // How deep handlers run inside one another, over the whole form.
     virtual int& handler_depth() = 0;
+    virtual bool delivering_sent_keys() const = 0;
 };
 
 // The part "page" of a property page: its Changed flag, and the design-time services.
@@ -126,6 +127,7 @@ private:
     void send_keys(std::string_view keys) override { form_.queue_keys(*this, keys); }
     int16_t key_state(int16_t virtual_key) override { return form_.key_state(virtual_key); }
     void process_pending() override {}  // every notification is delivered at once: nothing waits
+    bool delivering_sent_keys() const override { return form_.delivering_sent_keys(); }
 
     template <class W>
     W& add_part(std::string_view name);

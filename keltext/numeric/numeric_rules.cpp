@@ -114,7 +114,8 @@ int filter_key(Work& w, const NumericEdit& e, int key) {
     w.save_old_text();
 
     const int len = w.len();
-    int caret = w.caret();
+    const int start_caret = w.caret();
+    int caret = start_caret;
     const int dot = w.dot();
     const int room = integer_room(e.limit, e.decimals);
     const char ch = static_cast<char>(key);
@@ -202,10 +203,16 @@ int filter_key(Work& w, const NumericEdit& e, int key) {
     }
 
     if (final_checks) {
-        // The range is checked on the text before the edit box inserts the key.
-        double value = leading_value(w.text());
-        bool outside = e.max_value > 0 ? (value > e.max_value || value < e.min_value) : value < e.min_value;
-        if (outside) w.set_text(std::string(old_text));
+        // Only the upper bound is checked while typing: a number being typed passes through
+        // its smaller prefixes ("0", "0." on the way to "0.5"), so the lower bound waits for
+        // the exit. The check sees the text before the edit box inserts the key; it undoes
+        // what the filter wrote itself, and then the key goes too, with the caret back where
+        // it was, so no half-reverted text is left for the key to land in.
+        if (e.max_value > 0 && w.text() != old_text && leading_value(w.text()) > e.max_value) {
+            w.set_text(std::string(old_text));
+            w.set_caret(start_caret);
+            key = 0;
+        }
         if (key != kPoint && key != 0 && w.text() == "0" && dot == 0) w.set_text("");
     }
     return key;

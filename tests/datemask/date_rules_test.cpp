@@ -110,6 +110,7 @@ TEST(FormatParts, DayAndMonth) {
         {" 5/ 5/    ", "05", "05"},
         {"  /  /    ", "01", "01"},
         {"00/00/    ", "01", "01"},
+        {"31/12/    ", "31", "12"},  // the last day and month are kept, not wiped
         {"32/13/    ", "", ""},
         {"45/10/    ", "", "10"},
         {"09/1 /    ", "09", "01"},
@@ -120,6 +121,57 @@ TEST(FormatParts, DayAndMonth) {
         EXPECT_EQ(FormatDayPart(c.text), c.day) << c.text;
         EXPECT_EQ(FormatMonthPart(c.text), c.month) << c.text;
     }
+}
+
+TEST(SlashCompletion, TypedFieldCountsFromTheCaret) {
+    // What "/" completes from when the person typed into the field the caret is in: the
+    // rest of that field is left over from the old date.
+    struct Case {
+        const char* text;
+        int32_t caret;
+        const char* expected;
+        const char* day;
+        const char* month;
+    };
+    const Case cases[] = {
+        {"56/12/2026", 1, "5 /12/2026", "05", "12"},
+        {"05/82/2026", 4, "05/8 /2026", "05", "08"},
+        {"05/12/2026", 3, "05/  /2026", "05", "01"},
+        {"05/12/2026", 2, "05/12/2026", "05", "12"},  // on the separator: nothing of the day left
+        {"05/12/2026", 5, "05/12/2026", "05", "12"},
+        {"05/12/2026", 7, "05/12/2   ", "05", "12"},
+        {"05/12/2026", -1, "05/12/2026", "05", "12"},
+        {"5", 0, " ", "01", "01"},
+    };
+    for (const auto& c : cases) {
+        const std::string t = BlankFieldFromCaret(c.text, c.caret);
+        EXPECT_EQ(t, c.expected) << c.text << " caret " << c.caret;
+        EXPECT_EQ(FormatDayPart(t), c.day) << c.text;
+        EXPECT_EQ(FormatMonthPart(t), c.month) << c.text;
+    }
+    const std::pair<int32_t, DateField> fields[] = {{-1, DateField::none}, {0, DateField::day},
+                                                     {2, DateField::day},   {3, DateField::month},
+                                                     {5, DateField::month}, {6, DateField::year}};
+    for (const auto& [caret, field] : fields) EXPECT_EQ(DateFieldAt(caret), field) << caret;
+}
+
+TEST(BlankSelection, InputPositionsOnly) {
+    struct Case {
+        const char* text;
+        const char* mask;
+        int32_t start, length;
+        const char* expected;
+    };
+    const Case cases[] = {
+        {"06/12/2026", "##/##/####", 0, 10, "__/__/____"},
+        {"06/12/2026", "##/##/####", 1, 3, "0_/_2/2026"},
+        {"06/12/2026", "##/##/####", 8, 5, "06/12/20__"},  // past the end: cut there
+        {"05/26A", "##/##?", 0, 6, "__/___"},
+        {"05/26", "##/##?", 0, 6, "__/__"},              // a text shorter than its mask
+        {"06/12/2026", "", 0, 10, "06/12/2026"},         // no mask, no input positions
+    };
+    for (const auto& c : cases)
+        EXPECT_EQ(BlankSelection(c.text, c.mask, c.start, c.length), c.expected) << c.text << " " << c.start;
 }
 
 TEST(CheckMonthYear, Table) {

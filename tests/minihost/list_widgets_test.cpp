@@ -95,7 +95,7 @@ TEST(ComboBox, ListIndexPutsTheEntryInWithoutChangeAndRaisesClick) {
     EXPECT_EQ(c.Text(), "Banana");
     EXPECT_EQ(log, (std::vector<std::string>{"click Banana"}));
 
-    // Up and Down step within the list; typing leaves the selection as it is.
+    // Up and Down step within the list, from -1 to the first entry.
     const struct {
         int16_t key;
         int32_t index;
@@ -106,19 +106,54 @@ TEST(ComboBox, ListIndexPutsTheEntryInWithoutChangeAndRaisesClick) {
     }
     EXPECT_EQ(c.Text(), "Banana");
     EXPECT_EQ(c.ItemData(1), 42);
-    act(c, "down:35");
-    act(c, "type:s");
-    EXPECT_EQ(c.Text(), "Bananas");
-    EXPECT_EQ(c.ListIndex(), 1);
+    c.ListIndex(1);
+    EXPECT_EQ(log.back(), "click Banana");  // picked again: Click again
+    EXPECT_EQ(log.size(), 6u);
 
-    // Removing entries keeps the selection on its entry, or drops it with its entry.
-    c.RemoveItem(0);
-    EXPECT_EQ(c.ListIndex(), 0);
-    EXPECT_EQ(c.NewIndex(), -1);
-    c.RemoveItem(0);
+    // List edits move the selection as a list box does and leave the text alone.
+    c.AddItem("Avocado", 0);
+    EXPECT_EQ(c.ListIndex(), 2);
+    c.RemoveItem(2);
     EXPECT_EQ(c.ListIndex(), -1);
+    EXPECT_EQ(c.Text(), "Banana");
     c.Clear();
     EXPECT_EQ(c.ListCount(), 0);
+}
+
+TEST(ComboBox, ListIndexFollowsTheEditText) {
+    RecordingContext ctx;
+    MiniComboBox c(ctx, "cbo", 1, 1200, 300);
+    std::vector<int32_t> seen_by_change;
+    int clicks = 0;
+    WidgetEvents ev;
+    ev.change = [&] { seen_by_change.push_back(c.ListIndex()); };
+    ev.click = [&] { ++clicks; };
+    c.set_events(ev);
+    for (const char* s : {"Cash", "", "Cheque", "cheque"}) c.AddItem(s);
+    const struct {
+        const char* what;
+        int32_t index;
+    } steps[] = {
+        {"text:CHEQUE", 2},     // ignoring case, the first entry that equals it
+        {"type:s", -1},         // no entry is "CHEQUEs"
+        {"backspace", 2},
+        {"text:", -1},          // an empty field is no choice, even beside an empty entry
+        {"paste:cash", 0},
+        {"text:cas", -1},
+    };
+    for (const auto& s : steps) {
+        SCOPED_TRACE(s.what);
+        const std::string_view w = s.what;
+        if (w.starts_with("text:")) c.Text(std::string(w.substr(5)));
+        else if (w == "backspace") act(c, "press:8");
+        else {
+            if (w.starts_with("paste:")) c.user_select(0, static_cast<int32_t>(c.Text().size()));
+            act(c, s.what);
+        }
+        EXPECT_EQ(c.ListIndex(), s.index);
+        EXPECT_EQ(seen_by_change.back(), s.index);  // already there when Change is raised
+    }
+    EXPECT_EQ(clicks, 0);
 }
 
 TEST(ComboBox, DropDownListStyleTakesNoTyping) {

@@ -160,6 +160,8 @@ TEST(FilterNumericKey, NothingSelected) {
     const Settings max100 = with(kDec2, [](Settings& s) { s.decimals = 0; s.max_value = 100; });
     const Settings tight = with(kDec2, [](Settings& s) { s.decimals = 1; s.limit = 4; s.max_value = 45.5; });
     const Settings no_room = with(kDec2, [](Settings& s) { s.limit = 3; });
+    const Settings min01 = with(kDec2, [](Settings& s) { s.min_value = 0.1; });
+    const Settings min10 = with(kDec2, [](Settings& s) { s.min_value = 10; });
     const std::vector<PressCase> cases = {
         {"first digit", "", 0, 0, '1', kDec2, "1", 1, '1', ""},
         {"fifth digit brings the point", "1234", 4, 0, '5', kDec2, "1234.5", 6, 0, "{END}"},
@@ -179,6 +181,11 @@ TEST(FilterNumericKey, NothingSelected) {
         {"backspace keeps the point", "1234.5", 5, 0, '\b', kDec2, "1234.5", 5, 0, ""},
         {"range is checked before insertion", "99", 2, 0, '9', max100, "999", 3, '9', ""},
         {"automatic point out of range", "45", 2, 0, '7', tight, "45", 2, 0, "{END}"},
+        {"automatic point exactly on the bound", "45", 2, 0, '5', tight, "45.5", 4, 0, "{END}"},
+        {"0. below MinValue is typed on", "0", 1, 0, '.', min01, "0.", 2, 0, "{END}"},
+        {"a digit into 0. below MinValue", "0.", 2, 0, '5', min01, "0.5", 3, 0, ""},
+        {"a point into empty with a high MinValue", "", 0, 0, '.', min10, "0.", 2, 0, "{END}"},
+        {"a text already above MaxValue is not the filter's", "999", 3, 0, '9', max100, "9999", 4, '9', ""},
         {"no decimals: point refused", "12", 2, 0, '.', with(kDec2, [](Settings& s) { s.decimals = 0; }), "12", 2,
          0, "", 1},
         {"no integer room: point alone", "", 0, 0, '.', no_room, ".", 1, 0, "{END}"},
