@@ -102,6 +102,7 @@ void KelNumeric::Borderstyle(KelNBorderStyle v) {
     if (v < -32768 || v > 32767) raise_error(kOverflow);
     site_.surface().BorderStyle(static_cast<int16_t>(v));
     if (v == KelNPlain) UpDownNumeric.Visible(false);
+    if (v == KelNFixedSingle && mUpDownScroll) UpDownNumeric.Visible(true);  // room again for kept buttons
     site_.property_changed("BorderStyle");
     LayoutConstituents();
 }
@@ -294,7 +295,13 @@ void KelNumeric::ReadProperties(PropertyBag& bag) {
     Surface& surface = site_.surface();
     restore_step([&] { mIncrement = bag.read("Increment", Variant(int16_t{0})); });
     restore_step([&] { surface.BorderStyle(to_int16(bag.read("BorderStyle", Variant(int16_t{1})))); });
-    restore_step([&] { UpDownScroll(to_bool(bag.read("UpDownScroll", Variant(false)))); });
+    restore_step([&] {
+        const bool buttons = to_bool(bag.read("UpDownScroll", Variant(false)));
+        // A plain box has no room for the buttons, but keeps the stored choice (hidden), so that
+        // a form opened and saved again stores what it loaded.
+        if (surface.BorderStyle() == KelNPlain) mUpDownScroll = buttons;
+        else UpDownScroll(buttons);
+    });
     restore_step([&] { MaxValue(bag.read("Maxvalue", Variant(int16_t{0}))); });
     restore_step([&] { MinValue(bag.read("MinValue", Variant(int16_t{0}))); });
     restore_step([&] { txtNumeric.ForeColor(to_int32(bag.read("Forecolor", Variant(kDefaultForeColor)))); });

@@ -1,6 +1,9 @@
 #include "keltext/numeric/number_format.h"
 
 #include <algorithm>
+#include <cmath>
+#include <cstdio>
+#include <cstdlib>
 
 #include "keltext/host/conversions.h"
 
@@ -28,11 +31,44 @@ std::string_view last_chars(std::string_view t, int n, std::string& sign) {
 std::string assigned_text(const Variant& value) {
     if (value.is_string()) return StripGrouping(value.str());
     if (value.is_empty()) return {};
-    if (value.is_number()) return text_of(value);
-    return plain_number_text(value.number());  // boolean, date
+    if (value.is_number()) {
+        std::string t = text_of(value);
+        return t.find('E') == std::string::npos ? t : BoxNumberText(value.number());
+    }
+    return BoxNumberText(value.number());  // boolean, date
 }
 
 }  // namespace
+
+std::string BoxNumberText(double value) {
+    std::string plain = plain_number_text(value);
+    if (plain.find('E') == std::string::npos || !std::isfinite(value)) return plain;
+    // d.dddddddddddddde+XXX: the 15 significant digits and the power of ten of the first.
+    char buf[40];
+    std::snprintf(buf, sizeof buf, "%.*e", kMaxSignificantDigits - 1, std::fabs(value));
+    const std::string_view sci(buf);
+    const std::size_t e = sci.find('e');
+    std::string digits;
+    for (char c : sci.substr(0, e))
+        if (c != '.') digits += c;
+    while (digits.size() > 1 && digits.back() == '0') digits.pop_back();
+    const int exponent = std::atoi(buf + e + 1);
+    std::string out = value < 0 ? "-" : "";
+    if (exponent >= 0) {
+        const auto whole = static_cast<std::size_t>(exponent) + 1;
+        if (digits.size() <= whole) {
+            out += digits;
+            out.append(whole - digits.size(), '0');
+        } else {
+            out.append(digits, 0, whole).append(".").append(digits, whole);
+        }
+    } else {
+        out += "0.";
+        out.append(static_cast<std::size_t>(-exponent - 1), '0');
+        out += digits;
+    }
+    return out;
+}
 
 std::string GroupIndian(std::string_view t) {
     std::string_view sign;
@@ -111,7 +147,7 @@ std::string ShapeAssignedText(const Variant& value, const NumericLimits& limits)
         v = limits.min_value;
         replaced = true;
     }
-    std::string text = replaced ? plain_number_text(v) : assigned_text(value);
+    std::string text = replaced ? BoxNumberText(v) : assigned_text(value);
 
     std::size_t dot = text.find('.');
     int room = std::max(limits.max_length - limits.decimals - 1, 0);

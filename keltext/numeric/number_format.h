@@ -25,6 +25,15 @@ std::string StripGrouping(std::string_view text);
 // The empty text becomes "0." and the zeros. Nothing happens when `decimals` is not above 0.
 std::string PadDecimals(std::string_view text, int decimals);
 
+// The significant digits a double keeps: the box takes no more integer digits and decimals
+// together, so that what is typed is what it shows.
+inline constexpr int kMaxSignificantDigits = 15;
+
+// A number as the box shows it: its plain number text, except that a number the plain text
+// would write with an exponent (from 1E+15, or a tiny fraction) is written in plain digits,
+// rounded to 15 significant digits, the rest zeros.
+std::string BoxNumberText(double value);
+
 // The limits a value assigned through Text is shaped to.
 struct NumericLimits {
     int decimals = 0;         // NoOfDecimals

@@ -336,26 +336,66 @@ NumericDecision ReplaceSelection(const NumericEdit& e, int16_t key_ascii) {
     return d;
 }
 
-NumericDecision numeric_key_press(const NumericEdit& e, int16_t key_ascii, bool ctrl_down) {
+namespace {
+
+// Digits before the point, leading zeros not counted.
+int significant_integer_digits(std::string_view t) {
+    t = t.substr(0, std::min(t.find('.'), t.size()));
+    int n = 0;
+    bool leading = true;
+    for (char c : t) {
+        if (c < '0' || c > '9') continue;
+        if (leading && c == '0') continue;
+        leading = false;
+        ++n;
+    }
+    return n;
+}
+
+// A double holds 15 significant digits: a digit typed beyond them would be shown changed (or in
+// exponent form) when the box formats it, so it is refused as it is typed. `w` is the box as
+// the decision leaves it, before the edit box inserts `key` over its selection.
+bool digit_beyond_precision(const NumericEdit& e, const Work& w, int typed, int key) {
+    if (typed < '0' || typed > '9') return false;
+    const std::string_view text = w.text();
+    const auto caret = static_cast<std::size_t>(w.caret());
+    const char inserted = static_cast<char>(key);
+    const int digits = significant_integer_digits(
+        joined(text.substr(0, caret), key >= 32 && key <= 255 ? std::string_view(&inserted, 1) : std::string_view{},
+               text.substr(caret + static_cast<std::size_t>(w.sel()))));
+    return digits > significant_integer_digits(e.text) && digits + std::max(e.decimals, 0) > kMaxSignificantDigits;
+}
+
+NumericDecision refused_digit(const NumericEdit& e, std::optional<bool> overwrite) {
     NumericDecision d;
-    Work w(e, d);
+    d.overwrite = overwrite;
+    if (e.trigger_error) {
+        EditStep s;
+        s.kind = EditStep::Kind::control_error;
+        d.push(std::move(s));
+    }
+    return d;
+}
+
+// The key press as the rules decide it, on the working state; the decision's key is set.
+void decide_key_press(NumericDecision& d, Work& w, const NumericEdit& e, int16_t key_ascii, bool ctrl_down) {
     int key = key_ascii;
     if (key == 9 || key == 10) {
         d.key = key_ascii;
-        return d;
+        return;
     }
-    if (key == 13) return d;
+    if (key == 13) return;
     if (key == 47) {
         w.set_text("");
-        return d;
+        return;
     }
     if (ctrl_down) {  // keys typed with Ctrl are not filtered
         d.key = key_ascii;
-        return d;
+        return;
     }
     if (w.sel() != 0) {
         d.key = static_cast<int16_t>(replace_selection(w, e, key));
-        return d;
+        return;
     }
     d.overwrite = e.overwrite;
     key = filter_key(w, e, key);
@@ -368,6 +408,15 @@ NumericDecision numeric_key_press(const NumericEdit& e, int16_t key_ascii, bool 
         else if (key == kPoint) key = 0;
     }
     d.key = static_cast<int16_t>(key);
+}
+
+}  // namespace
+
+NumericDecision numeric_key_press(const NumericEdit& e, int16_t key_ascii, bool ctrl_down) {
+    NumericDecision d;
+    Work w(e, d);
+    decide_key_press(d, w, e, key_ascii, ctrl_down);
+    if (!ctrl_down && digit_beyond_precision(e, w, key_ascii, d.key)) return refused_digit(e, d.overwrite);
     return d;
 }
 
@@ -378,16 +427,16 @@ NumericDecision format_on_exit(const NumericEdit& e) {
         // Read without separators: a text still grouped (TxtFormat turned off while the box
         // showed 12,34,567.50, or a pasted 1,234) is its whole number, not the part before
         // the first comma.
-        w.set_text(plain_number_text(leading_value(StripGrouping(w.text()))));
+        w.set_text(BoxNumberText(leading_value(StripGrouping(w.text()))));
         if (e.txt_format) {
             w.set_text(FormatGrouped(w.text()));
             w.set_max_length(w.len());  // the separators must fit
         }
     }
     if (e.max_value > 0 && !w.text().empty() && leading_value(StripGrouping(w.text())) > e.max_value)
-        w.set_text(plain_number_text(e.max_value));
+        w.set_text(BoxNumberText(e.max_value));
     if (!w.text().empty() && leading_value(StripGrouping(w.text())) < e.min_value)
-        w.set_text(plain_number_text(e.min_value));
+        w.set_text(BoxNumberText(e.min_value));
     if (e.decimals > 0) w.set_text(PadDecimals(w.text(), e.decimals));
     return d;
 }
@@ -404,7 +453,7 @@ std::string step_down_text(const SpinInput& in) {
             if (v <= in.min_value) v = in.min_value;
         }
     }
-    return plain_number_text(v);
+    return BoxNumberText(v);
 }
 
 std::string step_up_text(const SpinInput& in) {
@@ -415,7 +464,7 @@ std::string step_up_text(const SpinInput& in) {
     if (in.max_value > 0) {
         if (value >= in.max_value || v >= in.max_value) v = in.max_value;
     }
-    return plain_number_text(v);
+    return BoxNumberText(v);
 }
 
 }  // namespace kel

@@ -100,6 +100,20 @@ TEST(ShapeAssignedText, ShapesToTheLimits) {
     for (const auto& c : cases) EXPECT_EQ(ShapeAssignedText(c.value, c.limits), c.out) << c.out;
 }
 
+TEST(BoxNumberText, PlainDigitsWhereThePlainTextWouldTakeAnExponent) {
+    const std::pair<double, std::string> cases[] = {
+        {123.5, "123.5"},
+        {999999999999999.0, "999999999999999"},
+        {1e15, "1000000000000000"},
+        {12345678901234567.0, "12345678901234600"},
+        {-2.5e16, "-25000000000000000"},
+        {1e-20, "0.00000000000000000001"},
+        {1.7976931348623157e308, "17976931348623200" + std::string(292, '0')},
+    };
+    for (const auto& [value, text] : cases) EXPECT_EQ(BoxNumberText(value), text) << value;
+    EXPECT_EQ(ShapeAssignedText(1e20, {0, 400, 0, 0}), "100000000000000000000");
+}
+
 TEST(NumericValueOf, ReadsNumbersTextsAndOthers) {
     EXPECT_EQ(numeric_value_of(Variant("12.5")), 12.5);
     EXPECT_EQ(numeric_value_of(Variant("1,234")), 1234);

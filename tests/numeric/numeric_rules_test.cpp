@@ -321,6 +321,11 @@ TEST(NumericKeys, TypingAsAPerson) {
         {"1/2", kDec2, "2"},
         {"1234567", with(kDec2, [](Settings& s) { s.decimals = 0; }), "1234567"},
         {"12.5", with(kDec2, [](Settings& s) { s.decimals = 0; }), "125"},
+        // A double keeps 15 significant digits: integer digits and decimals together stop there.
+        {std::string(20, '9'), with(kDec2, [](Settings& s) { s.decimals = 0; s.limit = 400; }), std::string(15, '9')},
+        {"0001234567890123456", with(kDec2, [](Settings& s) { s.decimals = 0; s.limit = 400; }), "123456789012345"},
+        {"12345678901234.56", with(kDec2, [](Settings& s) { s.limit = 40; }), "1234567890123.56"},
+        {"1234567890123.45", with(kDec2, [](Settings& s) { s.limit = 40; }), "1234567890123.45"},
     };
     for (const auto& c : cases) {
         Box b{"", 0, 0, c.settings.limit, {}, 0};
