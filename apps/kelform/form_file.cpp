@@ -11,6 +11,8 @@
 #include <limits>
 #include <sstream>
 #include <system_error>
+#include <unordered_map>
+#include <unordered_set>
 
 #include "apps/kelform/script_player.h"
 #include "apps/kelform/script_syntax.h"
@@ -160,10 +162,11 @@ private:
         if (cls->is_page) fail(line_no, "'" + cls->name + "' is a property page, not a control");
         const std::string name(args[1]);
         if (!is_name(name)) fail(line_no, "'" + shown(name) + "' is not a name (letters, digits and _)");
-        for (const SavedControl& c : saved_.controls)
-            if (same_name(c.name, name))
-                fail(line_no, "a control named '" + c.name + "' is already on the form (line " +
-                                  std::to_string(c.line) + ")");
+        if (const auto [it, added] = names_.try_emplace(name_key(name), saved_.controls.size()); !added) {
+            const SavedControl& c = saved_.controls[it->second];
+            fail(line_no, "a control named '" + c.name + "' is already on the form (line " + std::to_string(c.line) +
+                              ")");
+        }
         current_.emplace();
         current_->class_name = cls->name;
         current_->name = name;
@@ -172,6 +175,7 @@ private:
         current_->comments = std::move(pending_comments_);
         pending_comments_.clear();
         seen_at_ = false;
+        stored_keys_.clear();
     }
 
     void end_line(std::span<const std::string_view> args, int line_no) {
@@ -218,8 +222,7 @@ private:
         if (args.size() != 2) fail(line_no, "'store' takes a key and a value");
         const std::string key(args[0]);
         if (!is_name(key)) fail(line_no, "'" + shown(key) + "' is not a key (letters, digits and _)");
-        for (const auto& [k, v] : current_->stored)
-            if (same_name(k, key)) fail(line_no, "'" + key + "' is stored twice");
+        if (!stored_keys_.insert(name_key(key)).second) fail(line_no, "'" + key + "' is stored twice");
         current_->stored.emplace_back(key, value_arg(args[1], line_no));
     }
 
@@ -245,6 +248,10 @@ private:
     bool seen_at_ = false;
     std::optional<SavedControl> current_;
     const ClassInfo* current_class_ = nullptr;
+    // Files may hold tens of thousands of controls, and a control many stored keys: duplicates
+    // are found through these, never by a scan.
+    std::unordered_map<std::string, std::size_t> names_;  // name_key -> index in saved_.controls
+    std::unordered_set<std::string> stored_keys_;         // name_key of the current control's keys
     std::vector<std::string> pending_comments_;
 };
 
@@ -461,25 +468,27 @@ void open_form(mini::Form& form, const SavedForm& saved, std::span<const ClassIn
 SavedForm capture_form(mini::Form& form, const SavedForm& saved) {
     SavedForm out = saved;
     int next_row = 1;
-    for (const SavedControl& c : out.controls) next_row = std::max(next_row, c.row + 2);
+    std::unordered_map<std::string, std::size_t> index;  // name_key -> place in out.controls
+    for (std::size_t i = 0; i < out.controls.size(); ++i) {
+        next_row = std::max(next_row, out.controls[i].row + 2);
+        index.try_emplace(name_key(out.controls[i].name), i);
+    }
     for (mini::HostedControl* hosted : form.controls()) {
-        auto it = std::find_if(out.controls.begin(), out.controls.end(),
-                               [&](const SavedControl& c) { return same_name(c.name, hosted->name()); });
-        if (it == out.controls.end()) {
-            SavedControl added;
-            added.class_name = hosted->info().name;
-            added.name = hosted->name();
-            added.label = hosted->name();
-            added.row = std::min(next_row, kMaxCell);
-            added.col = 20;
+        auto [it, added] = index.try_emplace(name_key(hosted->name()), out.controls.size());
+        if (added) {
+            SavedControl c;
+            c.class_name = hosted->info().name;
+            c.name = hosted->name();
+            c.label = hosted->name();
+            c.row = std::min(next_row, kMaxCell);
+            c.col = 20;
             next_row += 2;
             mini::Part& surface = hosted->surface_part();
-            added.width = static_cast<float>(surface.peek("Width").number());
-            added.height = static_cast<float>(surface.peek("Height").number());
-            out.controls.push_back(std::move(added));
-            it = out.controls.end() - 1;
+            c.width = static_cast<float>(surface.peek("Width").number());
+            c.height = static_cast<float>(surface.peek("Height").number());
+            out.controls.push_back(std::move(c));
         }
-        it->stored = form.save(*hosted);
+        out.controls[it->second].stored = form.save(*hosted);
     }
     return out;
 }

@@ -133,6 +133,19 @@ std::string json_string(std::string_view cp1252) {
 
 TerminalSession::TerminalSession(mini::Form& form, const SavedForm& saved, Date today)
     : form_(form), saved_(saved), today_(today) {
+    for (std::size_t i = 0; i < saved_.controls.size(); ++i) {
+        const SavedControl& c = saved_.controls[i];
+        saved_index_.try_emplace(name_key(c.name), i);
+        // A control stands on its field's row, and on its label's where that is placed apart.
+        const auto stands_on = [&](int row) {
+            if (row < 1) return;
+            const auto r = static_cast<std::size_t>(row);
+            if (by_row_.size() <= r) by_row_.resize(r + 1);
+            by_row_[r].push_back(i);
+        };
+        stands_on(c.row);
+        if (c.label_row && *c.label_row != c.row) stands_on(*c.label_row);
+    }
     form_.set_observer(this);
     for (HostedControl* c : form_.controls())
         if (c->can_take_focus()) {
@@ -146,13 +159,13 @@ TerminalSession::~TerminalSession() { form_.set_observer(nullptr); }
 // ---- the form's own code -------------------------------------------------------------------
 
 std::string TerminalSession::label_of(const HostedControl& control) const {
-    for (const SavedControl& c : saved_.controls)
-        if (same_name(c.name, control.name()) && !c.label.empty()) {
-            // "Amount (Rs)" is "Amount" on the status line.
-            const auto paren = c.label.find(" (");
-            return paren == std::string::npos || paren == 0 ? c.label : c.label.substr(0, paren);
-        }
-    return control.name();
+    const auto it = saved_index_.find(name_key(control.name()));
+    if (it == saved_index_.end()) return control.name();
+    const std::string& label = saved_.controls[it->second].label;
+    if (label.empty()) return control.name();
+    // "Amount (Rs)" is "Amount" on the status line.
+    const auto paren = label.find(" (");
+    return paren == std::string::npos || paren == 0 ? label : label.substr(0, paren);
 }
 
 void TerminalSession::log(std::string line) {
@@ -568,9 +581,36 @@ void TerminalSession::calendar_click(int row, int col) {
 
 // ---- drawing -------------------------------------------------------------------------------
 
+std::vector<std::size_t> TerminalSession::on_screen() const {
+    std::vector<std::size_t> out;
+    const int last = top_ + std::max(rows_ - 3, 1);
+    for (int row = top_ + 1; row <= last && row < static_cast<int>(by_row_.size()); ++row)
+        for (std::size_t i : by_row_[static_cast<std::size_t>(row)]) {
+            // The form does not scroll sideways: what starts past the right edge never shows.
+            const SavedControl& c = saved_.controls[i];
+            const bool label_apart = c.label_row && c.label_col;
+            int left = cols_;
+            if (c.row == row) left = label_apart ? c.col - 1 : c.col - 2 - static_cast<int>(c.label.size());
+            if (label_apart && *c.label_row == row) left = std::min(left, *c.label_col - 1);
+            if (left < cols_) out.push_back(i);
+        }
+    // The focused control, and the one whose list or calendar is open, are laid out wherever
+    // they stand: the cursor and the pop-ups are placed from them.
+    const auto add = [&](const std::string& name) {
+        if (const auto it = saved_index_.find(name_key(name)); it != saved_index_.end()) out.push_back(it->second);
+    };
+    if (const HostedControl* c = form_.focused()) add(c->name());
+    if (calendar_) add(calendar_->control);
+    if (list_) add(list_->control);
+    std::sort(out.begin(), out.end());
+    out.erase(std::unique(out.begin(), out.end()), out.end());
+    return out;
+}
+
 std::vector<TerminalSession::Layout> TerminalSession::layout() {
     std::vector<Layout> out;
-    for (const SavedControl& saved : saved_.controls) {
+    for (const std::size_t i : on_screen()) {
+        const SavedControl& saved = saved_.controls[i];
         HostedControl* c = form_.find(saved.name);
         if (!c) continue;
         Layout l;
@@ -761,11 +801,11 @@ void TerminalSession::render(Canvas& canvas) {
     const int pane_height = events_shown_ ? std::max((rows_ - 3) / 3, 4) : 0;
     const int last_row = std::max(rows_ - 3 - pane_height, 1);
     if (focused)
-        for (const SavedControl& c : saved_.controls)
-            if (same_name(c.name, focused->name())) {
-                if (c.row - top_ > last_row) top_ = c.row - last_row;
-                if (c.row - top_ < 1) top_ = c.row - 1;
-            }
+        if (const auto it = saved_index_.find(name_key(focused->name())); it != saved_index_.end()) {
+            const SavedControl& c = saved_.controls[it->second];
+            if (c.row - top_ > last_row) top_ = c.row - last_row;
+            if (c.row - top_ < 1) top_ = c.row - 1;
+        }
     top_ = std::max(top_, 0);
     last_layout_ = layout();
 

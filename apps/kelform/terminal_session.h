@@ -9,6 +9,7 @@
 #include <map>
 #include <optional>
 #include <string>
+#include <unordered_map>
 #include <vector>
 
 #include "apps/kelform/form_file.h"
@@ -108,6 +109,8 @@ private:
     void keep_failed_date(mini::HostedControl* left);
     bool finish_focus();
 
+    // The saved controls that may show on the screen as it is scrolled now, in file order.
+    std::vector<std::size_t> on_screen() const;
     std::vector<Layout> layout();
     Rect calendar_rect(const Layout& box, int rows, int cols) const;
     Rect list_rect(const Layout& box, int rows) const;
@@ -131,6 +134,10 @@ private:
     int rows_ = 24, cols_ = 80;          // the size last drawn, for clicks
     int top_ = 0;                        // form rows scrolled off the top
     std::vector<Layout> last_layout_;
+    // Forms may hold thousands of controls: a redraw looks at the rows on the screen, and names
+    // are found through a map, so that a keystroke costs the same however long the form is.
+    std::unordered_map<std::string, std::size_t> saved_index_;  // name_key -> saved_.controls
+    std::vector<std::vector<std::size_t>> by_row_;              // form row -> controls on it
 };
 
 // A JSON string literal of a text in the host's single-byte set.

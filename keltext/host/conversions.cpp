@@ -391,4 +391,11 @@ bool same_name(std::string_view a, std::string_view b) {
     return true;
 }
 
+std::string name_key(std::string_view name) {
+    std::string key(name);
+    for (char& c : key)
+        if (c >= 'A' && c <= 'Z') c = static_cast<char>(c + 32);
+    return key;
+}
+
 }  // namespace kel

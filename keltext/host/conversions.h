@@ -59,5 +59,8 @@ bool to_bool(const Variant& v);
 
 // Case-insensitive (ASCII) comparison of names: property keys, member names.
 bool same_name(std::string_view a, std::string_view b);
+// The key under which a name is looked up in a map: two names are the same_name exactly when
+// their keys are equal.
+std::string name_key(std::string_view name);
 
 }  // namespace kel

@@ -2,6 +2,7 @@
 
 #include <cmath>
 #include <deque>
+#include <unordered_map>
 
 #include "keltext/host/conversions.h"
 #include "keltext/host/errors.h"
@@ -58,6 +59,10 @@ public:
     bool insert_ = false;
     int32_t next_handle_ = 0x100;
     std::vector<std::unique_ptr<MiniSite>> sites_;
+    // Forms may hold tens of thousands of controls: names and sites are found through maps,
+    // never by a scan, so that loading, saving and each keystroke stay linear in the form.
+    std::unordered_map<std::string, MiniSite*> by_name_;            // name_key
+    std::unordered_map<const HostedControl*, std::size_t> place_;   // index in sites_
     MiniSite* focused_ = nullptr;
     std::deque<SentKey> queue_;
     bool delivering_ = false;
@@ -81,15 +86,14 @@ void check_size(float width, float height) {
 }  // namespace
 
 MiniSite& FormImpl::site_of(HostedControl& c) {
-    for (auto& s : sites_)
-        if (s.get() == &c) return *s;
-    throw FormError("control " + c.name() + " is not on this form");
+    const auto it = place_.find(&c);
+    if (it == place_.end()) throw FormError("control " + c.name() + " is not on this form");
+    return *sites_[it->second];
 }
 
 MiniSite* FormImpl::find(std::string_view name) {
-    for (auto& s : sites_)
-        if (same_name(s->name(), name)) return s.get();
-    return nullptr;
+    const auto it = by_name_.find(name_key(name));
+    return it == by_name_.end() ? nullptr : it->second;
 }
 
 void FormImpl::check_new_name(const std::string& name) {
@@ -106,6 +110,8 @@ MiniSite& FormImpl::add(const ClassInfo& cls, std::string name, float width, flo
     std::unique_ptr<Control> control = cls.create(*site);
     if (!control) throw FormError("class " + cls.name + " cannot be created");
     site->attach(std::move(control));
+    by_name_.emplace(name_key(site->name()), site.get());
+    place_.emplace(site.get(), sites_.size());
     sites_.push_back(std::move(site));
     return *sites_.back();
 }
@@ -141,18 +147,16 @@ Form::FocusResult FormImpl::focus(MiniSite* target) {
 }
 
 void FormImpl::tab(bool forward) {
-    std::vector<MiniSite*> order;
-    for (auto& s : sites_)
-        if (!s->is_page()) order.push_back(s.get());
-    const auto n = static_cast<std::ptrdiff_t>(order.size());
+    // Steps through creation order from the focused control, skipping pages and controls
+    // that cannot take focus; without focus, Tab starts at the first and Shift+Tab at the last.
+    const std::size_t n = sites_.size();
     if (n == 0) return;
-    std::ptrdiff_t start = forward ? -1 : n;
-    for (std::ptrdiff_t i = 0; i < n; ++i)
-        if (order[static_cast<std::size_t>(i)] == focused_) start = i;
-    for (std::ptrdiff_t step = 1; step <= n; ++step) {
-        std::ptrdiff_t i = ((start + (forward ? step : -step)) % n + n) % n;
-        MiniSite* s = order[static_cast<std::size_t>(i)];
-        if (s->can_take_focus()) {
+    std::size_t i = focused_ ? place_.at(focused_) : (forward ? n - 1 : 0);
+    const std::size_t steps = focused_ ? n - 1 : n;
+    for (std::size_t step = 0; step < steps; ++step) {
+        i = forward ? (i + 1) % n : (i + n - 1) % n;
+        MiniSite* s = sites_[i].get();
+        if (!s->is_page() && s->can_take_focus()) {
             focus(s);
             return;
         }

@@ -1,6 +1,6 @@
 #include "keltext/minihost/property_store.h"
 
-#include <algorithm>
+#include <cstddef>
 
 #include "keltext/host/conversions.h"
 #include "keltext/host/font.h"
@@ -31,34 +31,41 @@ bool stored_equal(const Variant& a, const Variant& b) {
 }
 
 PropertyStore::PropertyStore(const StoredValues& values) {
-    for (const auto& entry : values) {
-        const std::string& key = entry.first;
-        auto it = std::find_if(values_.begin(), values_.end(), [&](const auto& kv) { return same_name(kv.first, key); });
-        if (it != values_.end())
-            it->second = detached(entry.second);  // a repeated key: the last one wins
+    for (const auto& [key, value] : values) {
+        const auto [it, added] = index_.try_emplace(name_key(key), values_.size());
+        if (added)
+            values_.emplace_back(key, detached(value));
         else
-            values_.emplace_back(key, detached(entry.second));
+            values_[it->second].second = detached(value);  // a repeated key: the last one wins
     }
 }
 
 Variant PropertyStore::read(std::string_view key, const Variant& default_value) {
-    for (const auto& [k, v] : values_)
-        if (same_name(k, key)) return detached(v);
-    return default_value;
+    const auto it = index_.find(name_key(key));
+    return it == index_.end() ? default_value : detached(values_[it->second].second);
 }
 
 void PropertyStore::write(std::string_view key, const Variant& value, const Variant& default_value) {
-    auto it = std::find_if(values_.begin(), values_.end(), [&](const auto& kv) { return same_name(kv.first, key); });
+    std::string k = name_key(key);
+    const auto it = index_.find(k);
     bool keep = font_of(value) != nullptr || !stored_equal(value, default_value);
     if (!keep) {
         // Writing the default again takes an earlier value out: the store holds what differs.
-        if (it != values_.end()) values_.erase(it);
+        if (it != index_.end()) {
+            const std::size_t gone = it->second;
+            values_.erase(values_.begin() + static_cast<std::ptrdiff_t>(gone));
+            index_.erase(it);
+            for (auto& [name, place] : index_)
+                if (place > gone) --place;
+        }
         return;
     }
-    if (it != values_.end())
-        it->second = detached(value);
-    else
+    if (it != index_.end()) {
+        values_[it->second].second = detached(value);
+    } else {
+        index_.emplace(std::move(k), values_.size());
         values_.emplace_back(std::string(key), detached(value));
+    }
 }
 
 }  // namespace kel::mini

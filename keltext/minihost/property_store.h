@@ -1,6 +1,9 @@
 #pragma once
 // The minimal host's property store: what a form keeps of a control between sessions.
+#include <cstddef>
+#include <string>
 #include <string_view>
+#include <unordered_map>
 
 #include "keltext/host/container.h"
 #include "keltext/minihost/form.h"
@@ -22,6 +25,7 @@ public:
 
 private:
     StoredValues values_;
+    std::unordered_map<std::string, std::size_t> index_;  // name_key -> place in values_
 };
 
 // The store's notion of equal: numbers of any kinds with the same value (a boolean counts as

@@ -90,23 +90,38 @@ void MiniSite::property_changed(std::string_view name) {
 void MiniSite::raise_event(int number, std::string_view name, std::span<EventArg> args) {
     FormObserver* o = form_.observer();
     if (!o) return;
-    // The form's code may set properties that raise events again: without end, that is the
-    // control's error 28, as deep nesting of widget handlers is.
-    if (!enter_handler()) raise_error(kOutOfStackSpace);
-    struct Leave {
-        MiniSite& site;
-        ~Leave() { site.leave_handler(); }
-    } leave{*this};
-    std::vector<Variant> given;
-    given.reserve(args.size());
-    for (const auto& a : args) given.push_back(a.value);
-    o->event_raised(*this, number, name, args);
-    for (std::size_t i = 0; i < args.size(); ++i)
-        if (!(args[i].value == given[i])) args[i].value = coerce_like(args[i].value, given[i]);
+    // The form's code may set properties that raise events again: without end, the chain is
+    // cut as deep nesting of widget handlers is.
+    try {
+        if (!enter_handler()) throw HandlerOverflow{};
+        struct Leave {
+            MiniSite& site;
+            ~Leave() { site.leave_handler(); }
+        } leave{*this};
+        std::vector<Variant> given;
+        given.reserve(args.size());
+        for (const auto& a : args) given.push_back(a.value);
+        o->event_raised(*this, number, name, args);
+        for (std::size_t i = 0; i < args.size(); ++i)
+            if (!(args[i].value == given[i])) args[i].value = coerce_like(args[i].value, given[i]);
+    } catch (HandlerOverflow& overflow) {
+        // Only the outermost handler reports; an event raised by the form's driver itself (not
+        // from a widget's notification) is the control's own, on its surface.
+        if (handlers_running()) throw;
+        handler_overflow(overflow.where.empty() ? handler_where("surface", name) : overflow.where);
+    }
 }
 
 void MiniSite::handler_error(std::string_view part, std::string_view notification, int number) {
-    if (auto* o = form_.observer()) o->handler_error(name_ + "." + std::string(part) + "." + std::string(notification), number);
+    if (auto* o = form_.observer()) o->handler_error(handler_where(part, notification), number);
+}
+
+void MiniSite::handler_overflow(std::string_view where) {
+    if (auto* o = form_.observer()) o->handler_error(where, kOutOfStackSpace);
+}
+
+std::string MiniSite::handler_where(std::string_view part, std::string_view notification) const {
+    return name_ + "." + std::string(part) + "." + std::string(notification);
 }
 
 bool MiniSite::enter_handler() {

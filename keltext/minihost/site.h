@@ -93,6 +93,9 @@ public:
     void handler_error(std::string_view part, std::string_view notification, int number) override;
     bool enter_handler() override;
     void leave_handler() override { --form_.handler_depth(); }
+    bool handlers_running() const override { return form_.handler_depth() > 0; }
+    void handler_overflow(std::string_view where) override;
+    std::string handler_where(std::string_view part, std::string_view notification) const override;
     static constexpr int kMaxHandlerDepth = 100;
 
     // For the form.
@@ -106,19 +109,7 @@ public:
     // reported as "NAME.part.notification" and the form goes on.
     template <class F>
     void guarded(std::string_view part, std::string_view notification, F&& f) {
-        if (!enter_handler()) {
-            handler_error(part, notification, kOutOfStackSpace);
-            return;
-        }
-        struct Leave {
-            MiniSite& site;
-            ~Leave() { site.leave_handler(); }
-        } leave{*this};
-        try {
-            f();
-        } catch (const RuntimeError& e) {
-            handler_error(part, notification, e.number());
-        }
+        run_handler(*this, part, notification, std::forward<F>(f));
     }
     void raise_resize();
 

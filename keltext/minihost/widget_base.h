@@ -3,6 +3,7 @@
 // the owner's handlers, member access by name, and the person's input as the form delivers it.
 #include <cmath>
 #include <cstdint>
+#include <exception>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -22,6 +23,18 @@ inline constexpr int kReadOnlyProperty = 383;
 // "Out of stack space": handlers that notify each other without end are stopped with it.
 inline constexpr int kOutOfStackSpace = 28;
 
+// Handlers that notify each other without end (a Click handler that selects an entry, which
+// clicks again) are cut once they run too deep (the form sets the depth). The cut is not a
+// run-time error: a handler on the way that took it for one of its own would report it and go
+// on, and with two handlers a level the work would double with every level. It unwinds the
+// whole chain instead, and the outermost handler (the one the form's driver started) reports
+// error 28 once, naming the widget's notification where the chain was cut.
+class HandlerOverflow : public std::exception {
+public:
+    const char* what() const noexcept override { return "handlers nested too deep"; }
+    std::string where;  // "NAME.part.Notification"; empty until a widget's handler sees it
+};
+
 // What a widget needs of the site that owns it.
 class WidgetContext {
 public:
@@ -29,11 +42,38 @@ public:
     // A handler of the owner failed with a run-time error while the widget notified it.
     virtual void handler_error(std::string_view part, std::string_view notification, int number) = 0;
     // Brackets each handler call. False when handlers already run too deep inside one
-    // another (a Change handler that changes the text again, without end): the handler is
-    // then not called and the failure is reported instead of the stack running out.
+    // another: the handler is then not called, and the chain unwinds (HandlerOverflow).
     virtual bool enter_handler() { return true; }
     virtual void leave_handler() {}
+    // True while some handler runs: a HandlerOverflow goes on unwinding.
+    virtual bool handlers_running() const { return false; }
+    // The chain that was cut at `where` has unwound: report error 28 there, once.
+    virtual void handler_overflow(std::string_view /*where*/) {}
+    // "NAME.part.Notification" for this owner's part.
+    virtual std::string handler_where(std::string_view part, std::string_view notification) const {
+        return std::string(part) + "." + std::string(notification);
+    }
 };
+
+// Runs one of the owner's handlers for a notification of `part`. A run-time error it passes
+// back is the owner's failure while handling it: reported, and the caller goes on.
+template <class F>
+void run_handler(WidgetContext& context, std::string_view part, std::string_view notification, F&& f) {
+    try {
+        if (!context.enter_handler()) throw HandlerOverflow{};
+        struct Leave {
+            WidgetContext& context;
+            ~Leave() { context.leave_handler(); }
+        } leave{context};
+        f();
+    } catch (const RuntimeError& e) {
+        context.handler_error(part, notification, e.number());
+    } catch (HandlerOverflow& overflow) {
+        if (overflow.where.empty()) overflow.where = context.handler_where(part, notification);
+        if (context.handlers_running()) throw;
+        context.handler_overflow(overflow.where);
+    }
+}
 
 // A part the form can deliver a person's input to.
 class InputPart : public Part {
@@ -170,23 +210,9 @@ protected:
         return nullptr;
     }
 
-    // Runs an owner's handler. A run-time error it passes back is the owner's failure while
-    // handling the notification: reported to the form, and the widget goes on.
     template <class F>
     void guarded(std::string_view notification, F&& f) {
-        if (!context_.enter_handler()) {
-            context_.handler_error(name_, notification, kOutOfStackSpace);
-            return;
-        }
-        struct Leave {
-            WidgetContext& context;
-            ~Leave() { context.leave_handler(); }
-        } leave{context_};
-        try {
-            f();
-        } catch (const RuntimeError& e) {
-            context_.handler_error(name_, notification, e.number());
-        }
+        run_handler(context_, name_, notification, std::forward<F>(f));
     }
     void fire(std::string_view notification, const Notify& handler) {
         if (handler) guarded(notification, [&] { handler(); });
