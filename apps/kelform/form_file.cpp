@@ -19,6 +19,7 @@
 #include "keltext/host/charset.h"
 #include "keltext/host/conversions.h"
 #include "keltext/host/font.h"
+#include "keltext/minihost/property_store.h"
 #include "keltext/host/errors.h"
 
 namespace kel::kelform {
@@ -224,6 +225,7 @@ private:
         if (!is_name(key)) fail(line_no, "'" + shown(key) + "' is not a key (letters, digits and _)");
         if (!stored_keys_.insert(name_key(key)).second) fail(line_no, "'" + key + "' is stored twice");
         current_->stored.emplace_back(key, value_arg(args[1], line_no));
+        current_->stored_lines.push_back(line_no);
     }
 
     void set_line(std::span<const std::string_view> args, int line_no) {
@@ -428,6 +430,47 @@ Variant setting_value(std::string_view literal, Date today) {
     return parse_value(literal);
 }
 
+namespace {
+
+// Every value a control writes, with the default it gives, whether the store would keep it or not.
+class WrittenValues final : public PropertyBag {
+public:
+    struct Written {
+        std::string key;
+        Variant value;
+        Variant default_value;
+    };
+    Variant read(std::string_view, const Variant& default_value) override { return default_value; }
+    void write(std::string_view key, const Variant& value, const Variant& default_value) override {
+        written.push_back({std::string(key), value, default_value});
+    }
+    std::vector<Written> written;
+};
+
+// A stored value is taken when what the control would store for its key now equals it, or when
+// it is the key's default (nothing to store). Anything else would be lost at the next save.
+void check_stored(mini::HostedControl& hosted, const SavedControl& c, const std::string& file) {
+    WrittenValues now;
+    try {
+        hosted.control().WriteProperties(now);
+    } catch (const RuntimeError&) {
+        return;  // nothing to compare with: the control is left as it loaded
+    }
+    for (std::size_t i = 0; i < c.stored.size(); ++i) {
+        const auto& [key, value] = c.stored[i];
+        const int line = i < c.stored_lines.size() ? c.stored_lines[i] : c.line;
+        const auto w = std::find_if(now.written.begin(), now.written.end(),
+                                    [&](const WrittenValues::Written& x) { return same_name(x.key, key); });
+        if (w == now.written.end())
+            throw FormFileError(file, line, c.name + ": " + c.class_name + " stores no '" + key + "'");
+        if (mini::stored_equal(w->value, value) || mini::stored_equal(value, w->default_value)) continue;
+        throw FormFileError(file, line, c.name + ": stored " + key + " " + value_literal(value, key) +
+                                            " is not taken (the control keeps " + value_literal(w->value, key) + ")");
+    }
+}
+
+}  // namespace
+
 void open_form(mini::Form& form, const SavedForm& saved, std::span<const ClassInfo> classes, const std::string& file,
                Date today) {
     for (const SavedControl& c : saved.controls) {
@@ -437,6 +480,7 @@ void open_form(mini::Form& form, const SavedForm& saved, std::span<const ClassIn
             // The form then places the control at its size, as a container lays out a loaded
             // form: some controls set their own width while they read their properties.
             mini::HostedControl& hosted = form.load(*cls, c.name, c.stored, c.width, c.height);
+            check_stored(hosted, c, file);
             form.resize(hosted, c.width, c.height);
         } catch (const RuntimeError& e) {
             throw FormFileError(file, c.line, c.name + " could not load its stored values: error " +

@@ -56,6 +56,7 @@ struct SavedControl {
     float width = 1200;
     float height = 300;
     mini::StoredValues stored;
+    std::vector<int> stored_lines;  // the line of each stored value (0 for one not read from a file)
     std::vector<OpenSetting> settings;
     std::vector<std::string> comments;  // comment lines that stood in or before the block
     int line = 0;                       // the `control` line
@@ -94,7 +95,9 @@ Date financial_year_start(Date day);
 Date financial_year_end(Date day);
 
 // Loads every control of the saved form onto the form (in order, so tab order is file order) with
-// the stored values, then makes the opening settings. Errors name the file and line.
+// the stored values, then makes the opening settings. Errors name the file and line. A stored
+// value the control does not take (a key it does not store, a value of the wrong kind or out
+// of range, which would vanish the next time the form is saved) is an error too.
 void open_form(mini::Form& form, const SavedForm& saved, std::span<const ClassInfo> classes, const std::string& file,
                Date today);
 

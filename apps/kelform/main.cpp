@@ -11,8 +11,21 @@ int main(int argc, char** argv) {
     std::vector<std::string_view> args(argv + 1, argv + argc);
     std::string_view command = args.empty() ? std::string_view() : args[0];
     try {
-        if (command == "play")
-            return kel::kelform::play_command(std::span(args).subspan(1), std::cin, std::cout, std::cerr);
+        if (command == "play") {
+            const auto scripts = std::span(args).subspan(1);
+            for (std::string_view a : scripts) {
+                if (a == "--help" || a == "-h") {
+                    kel::kelform::print_usage(std::cout);
+                    return 0;
+                }
+                if (a.starts_with("-") && a != "-") {
+                    std::cerr << "kelform play: unknown option '" << a << "'\n"
+                              << "usage: kelform play SCRIPT.kfs ... ('-' reads standard input)\n";
+                    return 2;
+                }
+            }
+            return kel::kelform::play_command(scripts, std::cin, std::cout, std::cerr);
+        }
         if (command == "--help" || command == "-h" || command == "help") {
             kel::kelform::print_usage(std::cout);
             return 0;
@@ -21,8 +34,8 @@ int main(int argc, char** argv) {
             kel::kelform::print_version(std::cout);
             return 0;
         }
-        // `kelform`, `kelform run FILE` and anything else: the terminal side answers.
-        return kel::kelform::run_terminal(argc, argv);
+        // `kelform`, `kelform run FILE`, their options and anything else: the terminal side.
+        return kel::kelform::run_terminal(args);
     } catch (const std::exception& e) {
         std::cout.flush();
         std::cerr << "kelform: internal error: " << e.what() << '\n';

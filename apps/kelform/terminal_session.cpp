@@ -4,6 +4,7 @@
 #include <cmath>
 #include <cstdio>
 
+#include "apps/kelform/record.h"
 #include "apps/kelform/script_syntax.h"
 #include "keltext/host/charset.h"
 #include "keltext/host/conversions.h"
@@ -90,46 +91,7 @@ Date add_months(int year, int month, int day, int delta) {
     return make_date(y, m, d).value_or(Date{});
 }
 
-std::string json_number(double v) {
-    if (!std::isfinite(v)) return "null";
-    return plain_number_text(v);
-}
-
-std::string json_value(const Variant& v) {
-    switch (v.kind()) {
-        case VarKind::Empty: return "null";
-        case VarKind::Boolean: return *v.get_if<bool>() ? "true" : "false";
-        case VarKind::String: return json_string(v.str());
-        case VarKind::Date: return json_string(date_text(*v.get_if<Date>()));
-        case VarKind::Object: return "null";
-        default: return json_number(v.number());
-    }
-}
-
 }  // namespace
-
-std::string json_string(std::string_view cp1252) {
-    std::string out = "\"";
-    for (char c : cp1252) {
-        const auto b = static_cast<unsigned char>(c);
-        switch (c) {
-            case '"': out += "\\\""; break;
-            case '\\': out += "\\\\"; break;
-            case '\n': out += "\\n"; break;
-            case '\r': out += "\\r"; break;
-            case '\t': out += "\\t"; break;
-            default:
-                if (b < 0x20 || b == 0x7F) {
-                    char buf[8];
-                    std::snprintf(buf, sizeof buf, "\\u%04x", b);
-                    out += buf;
-                } else {
-                    append_utf8(out, to_unicode(b));
-                }
-        }
-    }
-    return out + "\"";
-}
 
 TerminalSession::TerminalSession(mini::Form& form, const SavedForm& saved, Date today)
     : form_(form), saved_(saved), today_(today) {
@@ -152,6 +114,7 @@ TerminalSession::TerminalSession(mini::Form& form, const SavedForm& saved, Date 
             form_.focus(c);
             break;
         }
+    saved_values_ = raw_values();
 }
 
 TerminalSession::~TerminalSession() { form_.set_observer(nullptr); }
@@ -224,7 +187,66 @@ void TerminalSession::keep_failed_date(HostedControl* left) {
 
 // ---- input ---------------------------------------------------------------------------------
 
+void TerminalSession::set_record_file(std::string path, RecordWriter write) {
+    record_path_ = std::move(path);
+    write_record_ = std::move(write);
+}
+
+std::vector<std::string> TerminalSession::raw_values() const {
+    std::vector<std::string> out;
+    for (HostedControl* c : form_.controls()) {
+        const mini::Part* edit = c->keyboard_part();
+        std::string text = edit ? edit->peek("Text").str() : std::string();
+        if (is_class(*c, "KelNumeric")) {
+            // The same amount grouped or not, padded or not, is no change.
+            std::erase(text, ',');
+            if (numeric_text(text)) text = plain_number_text(leading_value(text));
+        }
+        out.push_back(std::move(text));
+    }
+    return out;
+}
+
+bool TerminalSession::changed() const { return raw_values() != saved_values_; }
+
+bool TerminalSession::complete_field(bool come_back, std::string_view not_done) {
+    HostedControl* left = form_.focused();
+    if (!left) return true;
+    form_.focus(nullptr);
+    const auto allow = is_class(*left, "KelDateMask") ? property(*left, "AllowLostFocus") : std::nullopt;
+    if (allow && allow->number() == 0) {
+        form_.focus(left);
+        const std::string why = status_.empty() ? label_of(*left) + ": the date is not right" : status_;
+        say(why + " - " + std::string(not_done));
+        return false;
+    }
+    if (come_back) form_.focus(left);
+    return true;
+}
+
+bool TerminalSession::save_record() {
+    if (!record_path_) {
+        say("No record file: start kelform with --record FILE to save what is typed");
+        return false;
+    }
+    try {
+        write_record_(*record_path_, record_json(form_));
+    } catch (const std::exception& e) {
+        say(std::string("Not saved: ") + e.what());
+        return false;
+    }
+    saved_values_ = raw_values();
+    say("Saved to " + *record_path_);
+    return true;
+}
+
 TerminalSession::Outcome TerminalSession::handle(const Input& input) {
+    if (confirm_quit_) {
+        confirm_quit_ = false;
+        if (input.kind == Input::Kind::character && (input.ch == U'y' || input.ch == U'Y')) return Outcome::quit;
+        say("Changes kept");
+        return Outcome::going_on;
+    }
     status_.clear();
     HostedControl* before = form_.focused();
     Outcome outcome = Outcome::going_on;
@@ -252,17 +274,7 @@ void TerminalSession::deliver(const Keystroke& k) {
 bool TerminalSession::finish_focus() {
     // Finishing is like pressing the form's OK button: focus leaves the field first, so the
     // field completes and checks its value as it does when focus moves on.
-    HostedControl* left = form_.focused();
-    if (!left) return true;
-    form_.focus(nullptr);
-    const auto allow = is_class(*left, "KelDateMask") ? property(*left, "AllowLostFocus") : std::nullopt;
-    if (allow && allow->number() == 0) {
-        form_.focus(left);
-        const std::string why = status_.empty() ? label_of(*left) + ": the date is not right" : status_;
-        say(why + " - F10 again finishes as it is");
-        return false;
-    }
-    return true;
+    return complete_field(false, "F10 again finishes as it is");
 }
 
 TerminalSession::Outcome TerminalSession::handle_key(int16_t key, int16_t shift) {
@@ -276,10 +288,27 @@ TerminalSession::Outcome TerminalSession::handle_key(int16_t key, int16_t shift)
         if (list_key(key, shift)) return Outcome::going_on;
         list_.reset();
     }
-    if (key == kVkF10 || (ctrl && key == 'S')) {
-        return finish_focus() ? Outcome::finished : Outcome::going_on;
+    if (key == kVkF10 && shift == 0) {
+        // Without a record F10 only prints the values; with one it saves them first, and a
+        // save that fails keeps the form open so that nothing typed is lost.
+        HostedControl* editing = form_.focused();
+        if (!finish_focus()) return Outcome::going_on;
+        if (record_path_ && !save_record()) {
+            if (editing) form_.focus(editing);
+            return Outcome::going_on;
+        }
+        return Outcome::finished;
     }
-    if ((key == mini::kVkEscape && shift == 0) || (ctrl && key == 'Q')) return Outcome::quit;
+    if (ctrl && !alt && key == 'S') {
+        if (complete_field(true, "not saved")) save_record();
+        return Outcome::going_on;
+    }
+    if ((key == mini::kVkEscape && shift == 0) || (ctrl && !alt && key == 'Q')) {
+        if (!changed()) return Outcome::quit;
+        confirm_quit_ = true;
+        say("Discard changes? y/n");
+        return Outcome::going_on;
+    }
     if (key == kVkF2) {
         events_shown_ = !events_shown_;
         return Outcome::going_on;
@@ -311,6 +340,9 @@ TerminalSession::Outcome TerminalSession::handle_key(int16_t key, int16_t shift)
     if (key == mini::kVkBackspace || key == mini::kVkEnter) k.char_code = key;
     else if (ctrl && !alt && key >= 'A' && key <= 'Z') k.char_code = static_cast<int16_t>(key - 64);
     deliver(k);
+    // Enter moves on as Tab does, as clerks expect; the control (and the form's KeyPress)
+    // has had it first.
+    if (key == mini::kVkEnter && shift == 0 && form_.focused() == focused) form_.tab(true);
     return Outcome::going_on;
 }
 
@@ -858,22 +890,6 @@ void TerminalSession::render(Canvas& canvas) {
     canvas.put_text(rows_ - 1, std::max(cols_ - 5, 0), mode, status);
 }
 
-std::string TerminalSession::values_json() {
-    std::string out = "{";
-    bool first = true;
-    for (HostedControl* c : form_.controls()) {
-        Variant value;
-        try {
-            value = c->dispatch().get("Text");
-        } catch (const RuntimeError&) {
-            value = Variant();
-        }
-        out += first ? "\n  " : ",\n  ";
-        first = false;
-        out += json_string(c->name()) + ": " + json_value(value);
-    }
-    out += first ? "}" : "\n}";
-    return out;
-}
+std::string TerminalSession::values_json() { return record_json(form_); }
 
 }  // namespace kel::kelform

@@ -6,6 +6,7 @@
 // input into Input and copies the canvas to the screen.
 #include <cstdint>
 #include <deque>
+#include <functional>
 #include <map>
 #include <optional>
 #include <string>
@@ -36,7 +37,7 @@ struct Input {
 
 class TerminalSession : private mini::FormObserver {
 public:
-    enum class Outcome { going_on, finished, quit };
+    enum class Outcome { going_on, finished, quit, signalled };
 
     // The form must already hold the saved form's controls (open_form); the session becomes its
     // observer and puts focus in the first control that can take it.
@@ -45,11 +46,20 @@ public:
     TerminalSession(const TerminalSession&) = delete;
     TerminalSession& operator=(const TerminalSession&) = delete;
 
+    // Where Ctrl+S and F10 save the record of what was typed, and how (the writer throws a
+    // std::runtime_error whose message says why a save failed). Without one, F10 only prints.
+    using RecordWriter = std::function<void(const std::string& path, const std::string& json)>;
+    void set_record_file(std::string path, RecordWriter write);
+    // A message for the status line before anything is typed (a record that cannot be saved).
+    void warn(std::string message) { say(std::move(message)); }
+    // True when a value differs from the one the record was last saved (or opened) with.
+    bool changed() const;
+
     Outcome handle(const Input& input);
     // Draws the whole screen; the canvas size is the terminal's.
     void render(Canvas& canvas);
 
-    // The values as the form reads them through Text, one member per control, as JSON.
+    // The values as the form reads them through Text, one member per control: the record.
     std::string values_json();
 
     // For tests and the screen: the status line's message, the events pane's lines.
@@ -108,6 +118,13 @@ private:
     // The date box's rule: a box whose check failed (AllowLostFocus false) gets focus back.
     void keep_failed_date(mini::HostedControl* left);
     bool finish_focus();
+    // Completes the field being edited (focus leaves it and, with `come_back`, returns); false
+    // with the reason on the status line when its check fails.
+    bool complete_field(bool come_back, std::string_view not_done);
+    // Saves the record; false with the reason on the status line.
+    bool save_record();
+    // What each control holds, read without side effects (no checks run), to tell changes.
+    std::vector<std::string> raw_values() const;
 
     // The saved controls that may show on the screen as it is scrolled now, in file order.
     std::vector<std::size_t> on_screen() const;
@@ -134,13 +151,14 @@ private:
     int rows_ = 24, cols_ = 80;          // the size last drawn, for clicks
     int top_ = 0;                        // form rows scrolled off the top
     std::vector<Layout> last_layout_;
+    std::optional<std::string> record_path_;
+    RecordWriter write_record_;
+    std::vector<std::string> saved_values_;  // raw_values() when last saved or opened
+    bool confirm_quit_ = false;              // "Discard changes? y/n" is asked
     // Forms may hold thousands of controls: a redraw looks at the rows on the screen, and names
     // are found through a map, so that a keystroke costs the same however long the form is.
     std::unordered_map<std::string, std::size_t> saved_index_;  // name_key -> saved_.controls
     std::vector<std::vector<std::size_t>> by_row_;              // form row -> controls on it
 };
-
-// A JSON string literal of a text in the host's single-byte set.
-std::string json_string(std::string_view cp1252);
 
 }  // namespace kel::kelform

@@ -15,6 +15,7 @@
 
 #include <algorithm>
 #include <array>
+#include <csignal>
 #include <clocale>
 #include <cstdio>
 #include <cstdlib>
@@ -30,6 +31,8 @@
 namespace kel::kelform {
 
 namespace {
+
+constexpr int kPollMs = 250;  // how long a read waits before the loop looks at signals
 
 using mini::kAltMask;
 using mini::kCtrlMask;
@@ -180,6 +183,7 @@ public:
         nonl();
         keypad(stdscr, TRUE);
         set_escdelay(25);
+        timeout(kPollMs);  // reads come back now and then, so that a signal is seen
         mousemask(BUTTON1_PRESSED | BUTTON1_CLICKED | BUTTON1_DOUBLE_CLICKED, nullptr);
         mouseinterval(0);
         for (std::size_t i = 0; i < std::size(kModifiedKeys); ++i)
@@ -227,7 +231,7 @@ public:
             timeout(30);
             wint_t next = 0;
             const int r2 = get_wch(&next);
-            timeout(-1);
+            timeout(kPollMs);
             if (r2 == ERR) return Input::key_of(mini::kVkEscape);
             if (r2 == OK && (next == '[' || next == 'O')) {
                 // An escape sequence curses does not know (a key with modifiers it has no name
@@ -327,6 +331,37 @@ struct FileCloser {
     }
 };
 
+volatile std::sig_atomic_t g_signal = 0;
+
+extern "C" void note_signal(int sig) { g_signal = sig; }
+
+// SIGHUP and SIGTERM noted while the form runs; the earlier handlers back afterwards.
+class SignalGuard {
+public:
+    SignalGuard() {
+        struct sigaction sa {};
+        sa.sa_handler = note_signal;
+        sigemptyset(&sa.sa_mask);
+        sa.sa_flags = 0;  // no restart: a read in progress returns at once
+        sigaction(SIGHUP, &sa, &old_hup_);
+        sigaction(SIGTERM, &sa, &old_term_);
+    }
+    ~SignalGuard() { restore(); }
+    SignalGuard(const SignalGuard&) = delete;
+    SignalGuard& operator=(const SignalGuard&) = delete;
+    void restore() {
+        if (restored_) return;
+        restored_ = true;
+        sigaction(SIGHUP, &old_hup_, nullptr);
+        sigaction(SIGTERM, &old_term_, nullptr);
+    }
+
+private:
+    struct sigaction old_hup_ {};
+    struct sigaction old_term_ {};
+    bool restored_ = false;
+};
+
 }  // namespace
 
 bool terminal_ui_available() { return true; }
@@ -349,19 +384,28 @@ std::optional<TerminalSession::Outcome> run_tui(TerminalSession& session, std::s
         out = tty.get();
     }
     std::fflush(stdout);
-    Terminal terminal(out, stdin);
-    if (!terminal.open(error)) return std::nullopt;
-    for (;;) {
-        Canvas canvas(LINES, COLS);
-        session.render(canvas);
-        terminal.draw(canvas);
-        const std::optional<Input> input = terminal.read();
-        if (!input) continue;
-        if (input->kind == Input::Kind::key && input->key == 'C' && input->shift == kCtrlMask)
-            return TerminalSession::Outcome::quit;  // Ctrl+C leaves, as in any terminal program
-        const auto outcome = session.handle(*input);
-        if (outcome != TerminalSession::Outcome::going_on) return outcome;
+    // A hang-up or a kill request ends the form with the terminal restored (the alternate
+    // screen left, mouse reports off), then the signal ends the process as it would have.
+    g_signal = 0;
+    SignalGuard guard;
+    auto outcome = TerminalSession::Outcome::going_on;
+    {
+        Terminal terminal(out, stdin);
+        if (!terminal.open(error)) return std::nullopt;
+        while (outcome == TerminalSession::Outcome::going_on && g_signal == 0) {
+            Canvas canvas(LINES, COLS);
+            session.render(canvas);
+            terminal.draw(canvas);
+            const std::optional<Input> input = terminal.read();
+            if (input) outcome = session.handle(*input);
+        }
     }
+    if (const int sig = g_signal; sig != 0) {
+        guard.restore();
+        std::raise(sig);
+        return TerminalSession::Outcome::signalled;
+    }
+    return outcome;
 }
 
 }  // namespace kel::kelform

@@ -220,9 +220,66 @@ TEST_F(SessionTest, EventsPaneAndLeaving) {
     EXPECT_TRUE(event);
     key(kF2);
     EXPECT_FALSE(session->events_shown());
-    EXPECT_EQ(key(mini::kVkEscape), TerminalSession::Outcome::quit);
-    EXPECT_EQ(key('Q', mini::kCtrlMask), TerminalSession::Outcome::quit);
-    EXPECT_EQ(key('S', mini::kCtrlMask), TerminalSession::Outcome::finished);
+    // Something typed: leaving asks once, and anything but y keeps the form.
+    EXPECT_TRUE(session->changed());
+    EXPECT_EQ(key(mini::kVkEscape), TerminalSession::Outcome::going_on);
+    EXPECT_EQ(session->status(), "Discard changes? y/n");
+    type(U"n");
+    EXPECT_EQ(text("Payee"), Variant("A"));
+    EXPECT_EQ(key('Q', mini::kCtrlMask), TerminalSession::Outcome::going_on);
+    EXPECT_EQ(session->handle(Input::char_of(U'y')), TerminalSession::Outcome::quit);
+}
+
+TEST_F(SessionTest, CtrlSAndF10SaveTheRecord) {
+    // Without a record file Ctrl+S says how to get one; F10 only finishes.
+    type(U"anil");
+    EXPECT_EQ(key('S', mini::kCtrlMask), TerminalSession::Outcome::going_on);
+    EXPECT_TRUE(session->status().starts_with("No record file"));
+
+    std::vector<std::string> writes;
+    bool fail = true;
+    session->set_record_file("rec.json", [&](const std::string& path, const std::string& json) {
+        if (fail) throw std::runtime_error(path + ": Permission denied");
+        writes.push_back(json);
+    });
+    // A failed save says why and keeps the form open; nothing counts as saved.
+    EXPECT_EQ(key(kF10), TerminalSession::Outcome::going_on);
+    EXPECT_EQ(session->status(), "Not saved: rec.json: Permission denied");
+    fail = false;
+    tab(2);
+    type(U"2500");
+    // Ctrl+S completes the field (grouped and padded), saves, and comes back to it.
+    EXPECT_EQ(key('S', mini::kCtrlMask), TerminalSession::Outcome::going_on);
+    EXPECT_EQ(session->status(), "Saved to rec.json");
+    EXPECT_EQ(focused(), "Amount");
+    ASSERT_EQ(writes.size(), 1u);
+    EXPECT_NE(writes[0].find("\"Payee\": \"Anil\""), std::string::npos) << writes[0];
+    EXPECT_NE(writes[0].find("\"Amount\": 2500,"), std::string::npos) << writes[0];
+    EXPECT_NE(writes[0].find("\"Period\": null"), std::string::npos) << writes[0];
+    EXPECT_FALSE(session->changed());
+    EXPECT_EQ(key(mini::kVkEscape), TerminalSession::Outcome::quit);  // nothing to lose
+
+    // A date whose check fails is not saved; the status line says why.
+    tab(1);
+    type(U"31/02/2026");
+    session->set_record_file("rec.json", [&](const std::string&, const std::string& json) { writes.push_back(json); });
+    form.find("VoucherDate")->dispatch().set("TriggerError", Variant(true));
+    EXPECT_EQ(key('S', mini::kCtrlMask), TerminalSession::Outcome::going_on);
+    EXPECT_TRUE(session->status().ends_with("not saved")) << session->status();
+    EXPECT_EQ(writes.size(), 1u);
+    EXPECT_EQ(focused(), "VoucherDate");
+}
+
+TEST_F(SessionTest, EnterMovesOnAfterTheControlHadIt) {
+    type(U"anil");
+    key(mini::kVkEnter);
+    EXPECT_EQ(focused(), "PAN");
+    EXPECT_TRUE(logged("event Payee.KeyPress KeyAscii=13"));
+    tab(5);
+    ASSERT_EQ(focused(), "Period");
+    type(U"0626");
+    key(mini::kVkEnter);
+    EXPECT_EQ(focused(), "Payee");  // from the last field round to the first
 }
 
 TEST_F(SessionTest, TinyAndHugeScreensDrawWithoutHarm) {
@@ -276,10 +333,6 @@ TEST(SessionForms, AnEmptyFormStillRunsAndFinishes) {
     EXPECT_TRUE(c.row_text(0).ends_with(" kelform"));
     EXPECT_EQ(session.handle(Input::key_of(kF10)), TerminalSession::Outcome::finished);
     EXPECT_EQ(session.values_json(), "{}");
-}
-
-TEST(JsonString, EscapesAndConvertsToUtf8) {
-    EXPECT_EQ(json_string("a\"b\\c\n\x01\xE9\x80"), "\"a\\\"b\\\\c\\n\\u0001\u00e9\u20ac\"");
 }
 
 }  // namespace

@@ -1,7 +1,8 @@
 #!/usr/bin/env bash
 # Drives `kelform` in a real terminal (a private tmux server) as a person would: types into
 # every field of the demo voucher, checks what the screen shows, finishes with F10 and checks
-# the JSON printed; then runs a form file, checks it is saved, and leaves one with Escape.
+# the JSON printed; then fills in a form file with a record, saves it, opens it again with
+# the record, and leaves one with Escape.
 # usage: tui_tmux.sh KELFORM VOUCHER.kform
 # Exit 77 (skipped) when tmux is missing.
 set -euo pipefail
@@ -154,9 +155,10 @@ if [ "$actual" != "$expected" ]; then
   fail "the JSON printed differs"
 fi
 
-# ---- 2. a form file: the combo list, the calendar, saved on F10 ---------------------------
+# ---- 2. a form file with a record: fill in, Ctrl+S, F10, reopen -----------------------------
 cp "$voucher" "$work/v.kform"
-start run v.kform
+cp "$voucher" "$work/pristine.kform"
+start run v.kform --record rec.json
 wait_for "Payment voucher"
 send -l "anil"
 click_on "Amount (Rs)" "▲"                         # the spin buttons, by mouse
@@ -173,17 +175,51 @@ wait_for "Su Mo Tu We Th Fr Sa"
 send Home Enter
 day1=01/12/$fy
 expect_line "Voucher date" "$day1"
+send Tab Tab
+send -l "654321"
+send Tab
+send -l "0626"
+send C-s
+wait_for "Saved to rec.json"
+[ -s "$work/rec.json" ] || fail "Ctrl+S wrote no record"
 send F10
 status=$(wait_exit)
 [ "$status" = 0 ] || fail "exit status $status after F10 on a form file"
 grep -qF '"Payee": "Anil"' "$work/out" || fail "payee not printed: $(cat "$work/out")"
 grep -qF '"Amount": 101,' "$work/out" || fail "spin buttons not applied: $(cat "$work/out")"
 grep -qF "\"VoucherDate\": \"$day1\"" "$work/out" || fail "calendar day not printed: $(cat "$work/out")"
-grep -qF 'store Text "Anil"' "$work/v.kform" || fail "the form file was not saved with the payee"
+cmp -s "$work/out" "$work/rec.json" || fail "the record saved differs from the values printed"
+cmp -s "$work/v.kform" "$work/pristine.kform" || fail "filling the form in changed the form file"
 
-# ---- 3. Escape leaves without printing or saving -------------------------------------------
-cp "$work/v.kform" "$work/before.kform"
-start run v.kform
+# Opened again with its record, every field comes back as it was left; F10 at once prints
+# the same record again.
+cp "$work/rec.json" "$work/first.json"
+start run v.kform --record rec.json
+wait_for "Payment voucher"
+expect_line "Payee name" "Anil"
+expect_line "Amount (Rs)" "101.00"
+expect_line "Voucher date" "$day1"
+expect_line "Pay mode" "Card"
+expect_line "Cheque number" "654321"
+expect_line "Period (mm/yy)" "06/26"
+send F10
+status=$(wait_exit)
+[ "$status" = 0 ] || fail "exit status $status after F10 on a reopened record"
+cmp -s "$work/out" "$work/first.json" || fail "the reopened record differs: $(cat "$work/out")"
+
+# A blank amount stays blank: null in the record, empty when opened again.
+sed 's/"Amount": 101,/"Amount": null,/' "$work/first.json" > "$work/rec.json"
+start run v.kform --record rec.json
+wait_for "Payment voucher"
+expect_line "Payee name" "Anil"
+send F10
+status=$(wait_exit)
+[ "$status" = 0 ] || fail "exit status $status after F10 on a record with a blank amount"
+grep -qF '"Amount": null,' "$work/out" || fail "the blank amount came back as: $(cat "$work/out")"
+
+# ---- 3. Escape asks before changes are dropped, and drops nothing else ----------------------
+cp "$work/rec.json" "$work/before.json"
+start run v.kform --record rec.json
 wait_for "Payment voucher"
 send -l "x"
 send Tab Tab Tab                                  # to the voucher date, selected whole
@@ -191,9 +227,19 @@ send -l "5/8/$fy"
 send Tab
 expect_line "Voucher date" "05/08/$fy"
 send Escape
+wait_for "Discard changes? y/n"
+send -l "y"
 status=$(wait_exit)
 [ "$status" = 1 ] || fail "exit status $status after Escape"
 [ ! -s "$work/out" ] || fail "Escape printed: $(cat "$work/out")"
-cmp -s "$work/v.kform" "$work/before.kform" || fail "Escape changed the form file"
+cmp -s "$work/rec.json" "$work/before.json" || fail "Escape changed the record"
+cmp -s "$work/v.kform" "$work/pristine.kform" || fail "Escape changed the form file"
+
+# A record that names no control of the form: reported, the form not opened, the file kept.
+printf '{"Nobody": "x"}\n' > "$work/bad.json"
+start run v.kform --record bad.json
+status=$(wait_exit)
+[ "$status" = 2 ] || fail "exit status $status for a bad record"
+printf '{"Nobody": "x"}\n' | cmp -s - "$work/bad.json" || fail "a bad record was rewritten"
 
 echo "kelform in tmux: all steps passed"
