@@ -14,6 +14,7 @@
 #include <unordered_map>
 #include <unordered_set>
 
+#include "apps/kelform/safe_file.h"
 #include "apps/kelform/script_player.h"
 #include "apps/kelform/script_syntax.h"
 #include "keltext/host/charset.h"
@@ -393,21 +394,10 @@ std::string write_form(const SavedForm& form) {
 }
 
 void write_form_file(const std::string& path, const SavedForm& form) {
-    const std::string text = write_form(form);
-    const std::string temp = path + ".saving";
-    {
-        std::ofstream out(temp, std::ios::binary | std::ios::trunc);
-        if (!out) throw FormFileError(path, 0, "cannot write the file");
-        out << text;
-        out.flush();
-        if (!out) {
-            std::remove(temp.c_str());
-            throw FormFileError(path, 0, "cannot write the file");
-        }
-    }
-    if (std::rename(temp.c_str(), path.c_str()) != 0) {
-        std::remove(temp.c_str());
-        throw FormFileError(path, 0, "cannot replace the file");
+    try {
+        write_file_safely(path, write_form(form));
+    } catch (const SaveError& e) {
+        throw FormFileError(path, 0, e.reason());
     }
 }
 

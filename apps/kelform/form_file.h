@@ -77,7 +77,8 @@ SavedForm read_form_file(const std::string& path, std::span<const ClassInfo> cla
 
 // The text of a form file; parse_form of it gives the same form back.
 std::string write_form(const SavedForm& form);
-// Writes the file whole or not at all (through a temporary file beside it).
+// Writes the file whole or not at all, as write_file_safely does (FormFileError with line 0,
+// "voucher.kform: Permission denied", when it cannot).
 void write_form_file(const std::string& path, const SavedForm& form);
 
 // Value literals as form files and scripts write them: a literal that reads back as the same
