@@ -177,6 +177,35 @@ TEST_F(FormFileTest, OpeningSettingsThatFailNameTheirLine) {
     }
 }
 
+TEST_F(FormFileTest, StoredValuesTheControlDoesNotTakeNameTheirLine) {
+    // Each would open silently and vanish the next time the file is written.
+    const struct {
+        const char* store;
+        const char* message;
+    } cases[] = {
+        {"store NoOfDecimal 2", "t.kform:4: n: KelNumeric stores no 'NoOfDecimal'"},
+        {"store NoOfDecimals \"two\"", "t.kform:4: n: stored NoOfDecimals \"two\" is not taken (the control keeps 0)"},
+        {"store NoOfDecimals 99999999", "t.kform:4: n: stored NoOfDecimals 99999999 is not taken (the control keeps 0)"},
+    };
+    for (const auto& c : cases) {
+        const SavedForm saved = parse(std::string("form \"F\"\ncontrol KelNumeric n\n  at 1 1\n  ") + c.store + "\nend\n");
+        mini::Form form;
+        try {
+            open_form(form, saved, classes(), "t.kform", day(2026, 1, 1));
+            ADD_FAILURE() << "no error for " << c.store;
+        } catch (const FormFileError& e) {
+            EXPECT_EQ(std::string(e.what()), c.message);
+        }
+    }
+    // Taken: a value equal to the key's default, a key spelt in another case, a value of another
+    // kind that the control keeps as the same number.
+    const SavedForm fine = parse(
+        "form \"F\"\ncontrol KelNumeric n\n  at 1 1\n  store NoOfDecimals 0\n  store maxlength i32:9\n"
+        "  store TxtFormat -1\nend\n");
+    mini::Form form;
+    EXPECT_NO_THROW(open_form(form, fine, classes(), "t.kform", day(2026, 1, 1)));
+}
+
 TEST_F(FormFileTest, FinancialYearRunsFromAprilToMarch) {
     struct Case {
         Date today, start, end;
