@@ -29,6 +29,8 @@ constexpr std::size_t kMaxEvents = 500;
 constexpr int kCalendarHeight = 10;
 constexpr int kCalendarWidth = 22;
 constexpr int kListRows = 8;
+constexpr int kMinRows = 7;        // title, a few rows of the form, help and status lines
+constexpr int kMinFieldCells = 10; // what of a field must show at least
 
 constexpr const char* kMonthNames[] = {"January", "February", "March",     "April",   "May",      "June",
                                        "July",    "August",   "September", "October", "November", "December"};
@@ -108,6 +110,9 @@ TerminalSession::TerminalSession(mini::Form& form, const SavedForm& saved, Date 
         stands_on(c.row);
         if (c.label_row && *c.label_row != c.row) stands_on(*c.label_row);
     }
+    for (const SavedControl& c : saved_.controls) max_row_ = std::max({max_row_, c.row, c.label_row.value_or(c.row)});
+    // Every field must show its first cells: where the furthest one starts, and a little more.
+    for (const SavedControl& c : saved_.controls) min_cols_ = std::max(min_cols_, c.col - 1 + kMinFieldCells);
     form_.set_observer(this);
     for (HostedControl* c : form_.controls())
         if (c->can_take_focus()) {
@@ -126,9 +131,9 @@ std::string TerminalSession::label_of(const HostedControl& control) const {
     if (it == saved_index_.end()) return control.name();
     const std::string& label = saved_.controls[it->second].label;
     if (label.empty()) return control.name();
-    // "Amount (Rs)" is "Amount" on the status line.
+    // "Amount (Rs)" is "Amount" on the status line, which speaks UTF-8 like the terminal.
     const auto paren = label.find(" (");
-    return paren == std::string::npos || paren == 0 ? label : label.substr(0, paren);
+    return to_utf8(paren == std::string::npos || paren == 0 ? label : label.substr(0, paren));
 }
 
 void TerminalSession::log(std::string line) {
@@ -213,6 +218,7 @@ bool TerminalSession::complete_field(bool come_back, std::string_view not_done) 
     HostedControl* left = form_.focused();
     if (!left) return true;
     form_.focus(nullptr);
+    left_field_ = true;
     const auto allow = is_class(*left, "KelDateMask") ? property(*left, "AllowLostFocus") : std::nullopt;
     if (allow && allow->number() == 0) {
         form_.focus(left);
@@ -240,7 +246,65 @@ bool TerminalSession::save_record() {
     return true;
 }
 
+namespace {
+
+std::string edit_text(HostedControl& c) {
+    const mini::Part* edit = c.keyboard_part();
+    return edit ? edit->peek("Text").str() : std::string();
+}
+
+// The parts of a dd/mm/yyyy field as numbers, where they are typed in full.
+std::optional<int> date_part(std::string_view text, std::size_t at, std::size_t len) {
+    if (text.size() < at + len) return std::nullopt;
+    int v = 0;
+    for (char c : text.substr(at, len)) {
+        if (c < '0' || c > '9') return std::nullopt;
+        v = v * 10 + (c - '0');
+    }
+    return v;
+}
+
+// True when leaving the control changed the value typed (a number clamped, a date corrected),
+// not merely its form (grouping, padding, a two-digit year widened).
+bool value_changed(HostedControl& c, const std::string& before, const std::string& after) {
+    if (before.empty() || before == after) return false;
+    if (is_class(c, "KelNumeric")) {
+        std::string b = before, a = after;
+        std::erase(b, ',');
+        std::erase(a, ',');
+        return leading_value(b) != leading_value(a);
+    }
+    if (is_class(c, "KelDateMask")) {
+        const auto style = property(c, "DateStyle");
+        if (style && style->number() != 0) return false;
+        for (const std::size_t at : {std::size_t{0}, std::size_t{3}}) {
+            const auto b = date_part(before, at, 2), a = date_part(after, at, 2);
+            if (b && a && *b != *a) return true;
+        }
+        if (const auto b = date_part(before, 6, 4), a = date_part(after, 6, 4); b && a) return *b != *a;
+        if (const auto b = date_part(before, 6, 2), a = date_part(after, 6, 4); b && a) return *b != *a % 100;
+        return false;
+    }
+    return is_class(c, "KelAlphaNumeric");
+}
+
+}  // namespace
+
 TerminalSession::Outcome TerminalSession::handle(const Input& input) {
+    HostedControl* editing = form_.focused();
+    const std::string typed = editing ? edit_text(*editing) : std::string();
+    left_field_ = false;
+    const Outcome outcome = handle_input(input);
+    // The form tells the person when a box changed what they typed as they left it.
+    if (editing && (left_field_ || form_.focused() != editing) && status_.empty()) {
+        const std::string now = edit_text(*editing);
+        if (value_changed(*editing, typed, now))
+            say(label_of(*editing) + ": " + to_utf8(typed) + " was changed to " + to_utf8(now));
+    }
+    return outcome;
+}
+
+TerminalSession::Outcome TerminalSession::handle_input(const Input& input) {
     if (confirm_quit_) {
         confirm_quit_ = false;
         if (input.kind == Input::Kind::character && (input.ch == U'y' || input.ch == U'Y')) return Outcome::quit;
@@ -515,7 +579,8 @@ void TerminalSession::handle_click(int row, int col) {
     if (calendar_) {
         for (const Layout& l : last_layout_)
             if (l.control->name() == calendar_->control) {
-                if (calendar_rect(l, rows_, cols_).contains(row, col)) return calendar_click(row, col);
+                if (const auto p = calendar_place(l, rows_, cols_); p && p->rect.contains(row, col))
+                    return calendar_click(row, col);
                 break;
             }
         calendar_.reset();
@@ -586,21 +651,24 @@ void TerminalSession::list_click(int row, int col) {
 void TerminalSession::calendar_click(int row, int col) {
     for (const Layout& l : last_layout_) {
         if (l.control->name() != calendar_->control) continue;
-        const Rect r = calendar_rect(l, rows_, cols_);
+        const auto place = calendar_place(l, rows_, cols_);
+        if (!place) return;
+        const Rect r = place->rect;
+        const int in = place->inset;
         Calendar& c = *calendar_;
-        if (row == r.row + 1) {  // the title row: the arrows change the month
-            if (col <= r.col + 2) {
+        if (row == r.row + in) {  // the title row: the arrows change the month
+            if (col <= r.col + in + 1) {
                 const Ymd y = to_ymd(add_months(c.year, c.month, c.day, -1));
                 c.year = y.year, c.month = y.month, c.day = y.day;
-            } else if (col >= r.col + r.width - 3) {
+            } else if (col >= r.col + r.width - in - 2) {
                 const Ymd y = to_ymd(add_months(c.year, c.month, c.day, 1));
                 c.year = y.year, c.month = y.month, c.day = y.day;
             }
             return;
         }
-        const int week = row - (r.row + 3);
-        const int dow = (col - r.col - 1) / 3;
-        if (week < 0 || week > 5 || col <= r.col || dow < 0 || dow > 6) return;
+        const int week = row - (r.row + in + 2);
+        const int dow = (col - r.col - in) / 3;
+        if (week < 0 || week > 5 || col < r.col + in || dow < 0 || dow > 6) return;
         const auto first = make_date(c.year, c.month, 1);
         if (!first) return;
         const int day = week * 7 + dow - weekday(*first) + 1;
@@ -680,18 +748,35 @@ std::vector<TerminalSession::Layout> TerminalSession::layout() {
     return out;
 }
 
-TerminalSession::Rect TerminalSession::calendar_rect(const Layout& box, int rows, int cols) const {
+std::optional<TerminalSession::CalendarPlace> TerminalSession::calendar_place(const Layout& box, int rows,
+                                                                               int cols) const {
     const auto pos = property(*box.control, "CalendarPosition");
     const int corner = pos ? static_cast<int>(pos->number()) : 2;
-    const bool top = corner == 0 || corner == 1;
+    const bool top_first = corner == 0 || corner == 1;
     const bool right = corner == 1 || corner == 3;
-    Rect r{0, 0, kCalendarHeight, kCalendarWidth};
-    r.row = top ? box.field.row - kCalendarHeight : box.field.row + 1;
-    r.col = right ? box.field.col + box.field.width - kCalendarWidth : box.field.col;
-    // Kept on the screen, between the title bar and the help line.
-    r.row = std::clamp(r.row, 1, std::max(rows - 2 - kCalendarHeight, 1));
-    r.col = std::clamp(r.col, 0, std::max(cols - kCalendarWidth, 0));
-    return r;
+    // The calendar may use every row below the title bar, the help and status lines too, but
+    // never the field's own row: the person sees the date it is for.
+    for (const int inset : {1, 0}) {
+        const int height = kCalendarHeight - 2 * (1 - inset);
+        const int width = kCalendarWidth - 2 * (1 - inset);
+        int col = right ? box.field.col + box.field.width - width : box.field.col;
+        col = std::clamp(col, 0, std::max(cols - width, 0));
+        const int above = box.field.row - height, below = box.field.row + 1;
+        const bool fits_above = above >= 1;
+        const bool fits_below = below + height <= rows;
+        for (const bool up : {top_first, !top_first}) {
+            if (up && fits_above) return CalendarPlace{Rect{above, col, height, width}, inset};
+            if (!up && fits_below) return CalendarPlace{Rect{below, col, height, width}, inset};
+        }
+        // Beside the field, on the rows around it.
+        const int row = std::clamp(box.field.row - height / 2, 1, std::max(rows - height, 1));
+        if (row + height <= rows) {
+            if (box.field.col + box.field.width + width <= cols)
+                return CalendarPlace{Rect{row, box.field.col + box.field.width, height, width}, inset};
+            if (box.field.col - width >= 0) return CalendarPlace{Rect{row, box.field.col - width, height, width}, inset};
+        }
+    }
+    return std::nullopt;
 }
 
 TerminalSession::Rect TerminalSession::list_rect(const Layout& box, int rows) const {
@@ -783,7 +868,9 @@ void TerminalSession::draw_list(Canvas& canvas, const Rect& r) {
     }
 }
 
-void TerminalSession::draw_calendar(Canvas& canvas, const Rect& r) {
+void TerminalSession::draw_calendar(Canvas& canvas, const CalendarPlace& place) {
+    const Rect& r = place.rect;
+    const int in = place.inset;
     const Calendar& c = *calendar_;
     HostedControl* control = form_.find(c.control);
     const auto lo = control ? property(*control, "MinDate") : std::nullopt;
@@ -794,22 +881,23 @@ void TerminalSession::draw_calendar(Canvas& canvas, const Rect& r) {
     CellStyle frame;
     frame.fg = rgb(0, 0, 128);
     frame.bg = rgb(255, 255, 255);
-    canvas.box(r.row, r.col, r.height, r.width, frame);
+    if (in > 0) canvas.box(r.row, r.col, r.height, r.width, frame);
+    else canvas.fill(r.row, r.col, r.height, r.width, frame);
     const std::string title = std::string(kMonthNames[c.month - 1]) + " " + std::to_string(c.year);
     CellStyle bold = frame;
     bold.bold = true;
-    canvas.put_utf8(r.row + 1, r.col + 1, "◂", bold);
-    canvas.put_utf8(r.row + 1, r.col + r.width - 2, "▸", bold);
-    canvas.put_text(r.row + 1, r.col + 1 + (r.width - 2 - static_cast<int>(title.size())) / 2, title, bold);
-    canvas.put_text(r.row + 2, r.col + 1, "Su Mo Tu We Th Fr Sa", frame);
+    canvas.put_utf8(r.row + in, r.col + in, "◂", bold);
+    canvas.put_utf8(r.row + in, r.col + r.width - 1 - in, "▸", bold);
+    canvas.put_text(r.row + in, r.col + in + (r.width - 2 * in - static_cast<int>(title.size())) / 2, title, bold);
+    canvas.put_text(r.row + in + 1, r.col + in, "Su Mo Tu We Th Fr Sa", frame);
     const auto first = make_date(c.year, c.month, 1);
     if (!first) return;
     const int lead = weekday(*first);
     const int days = days_in_month(c.year, c.month);
     for (int day = 1; day <= days; ++day) {
         const int slot = lead + day - 1;
-        const int row = r.row + 3 + slot / 7;
-        const int col = r.col + 1 + (slot % 7) * 3;
+        const int row = r.row + in + 2 + slot / 7;
+        const int col = r.col + in + (slot % 7) * 3;
         const Date d{first->serial + day - 1};
         CellStyle s = frame;
         if ((min && d < *min) || (max && d > *max)) {
@@ -832,14 +920,40 @@ void TerminalSession::render(Canvas& canvas) {
     // the title bar and the help line.
     const int pane_height = events_shown_ ? std::max((rows_ - 3) / 3, 4) : 0;
     const int last_row = std::max(rows_ - 3 - pane_height, 1);
+    // When the screen grows, the form scrolls back as far as its rows allow.
+    top_ = std::min(top_, std::max(max_row_ - last_row, 0));
+    const SavedControl* focused_saved = nullptr;
     if (focused)
         if (const auto it = saved_index_.find(name_key(focused->name())); it != saved_index_.end()) {
-            const SavedControl& c = saved_.controls[it->second];
-            if (c.row - top_ > last_row) top_ = c.row - last_row;
-            if (c.row - top_ < 1) top_ = c.row - 1;
+            focused_saved = &saved_.controls[it->second];
+            if (focused_saved->row - top_ > last_row) top_ = focused_saved->row - last_row;
+            if (focused_saved->row - top_ < 1) top_ = focused_saved->row - 1;
         }
     top_ = std::max(top_, 0);
     last_layout_ = layout();
+
+    if (rows_ < kMinRows || cols_ < min_cols_) {
+        // A clipped form would hide fields or parts of them: say so instead.
+        last_layout_.clear();
+        calendar_.reset();
+        list_.reset();
+        canvas.fill(0, 0, rows_, cols_, CellStyle{});
+        canvas.put_text(0, 0, "Terminal too small", CellStyle{}, cols_);
+        canvas.put_text(std::min(1, rows_ - 1), 0,
+                        "for this form: it needs " + std::to_string(min_cols_) + "x" + std::to_string(kMinRows) +
+                            ", has " + std::to_string(cols_) + "x" + std::to_string(rows_),
+                        CellStyle{}, cols_);
+        return;
+    }
+    if (calendar_ && focused_saved && focused->name() == calendar_->control) {
+        // No place for the calendar with the field where it is: the field goes to the top row.
+        for (const Layout& l : last_layout_)
+            if (l.control == focused && !calendar_place(l, rows_, cols_) && top_ != focused_saved->row - 1) {
+                top_ = std::max(focused_saved->row - 1, 0);
+                last_layout_ = layout();
+                break;
+            }
+    }
 
     for (const Layout& l : last_layout_) draw_control(canvas, l, l.control == focused);
 
@@ -865,20 +979,11 @@ void TerminalSession::render(Canvas& canvas) {
                             cols_ - 2);
     }
 
-    if (calendar_) {
-        for (const Layout& l : last_layout_)
-            if (l.control->name() == calendar_->control) draw_calendar(canvas, calendar_rect(l, rows_, cols_));
-    }
-    if (list_) {
-        for (const Layout& l : last_layout_)
-            if (l.control->name() == list_->control) draw_list(canvas, list_rect(l, rows_));
-    }
-
     CellStyle help;
     help.dim = true;
     const char* keys = calendar_ ? " Arrows move  PgUp/PgDn month  Enter picks  Esc closes"
                        : list_   ? " Up/Down move  Enter picks  Esc closes"
-                                 : " Tab next  F4 list/calendar  Ins overwrite  F2 events  F10 finish  Esc quit";
+                                 : " Tab next  F4 list/calendar  F2 events  Ctrl+S save  F10 finish  Esc quit";
     canvas.fill(rows_ - 2, 0, 1, cols_, help);
     canvas.put_text(rows_ - 2, 0, keys, help, cols_);
 
@@ -886,8 +991,18 @@ void TerminalSession::render(Canvas& canvas) {
     status.reverse = true;
     canvas.fill(rows_ - 1, 0, 1, cols_, status);
     const std::string mode = form_.insert_on() ? " OVR " : " INS ";
-    canvas.put_text(rows_ - 1, 1, status_, status, std::max(cols_ - 7, 0));
+    canvas.put_utf8(rows_ - 1, 1, status_, status, std::max(cols_ - 7, 0));
     canvas.put_text(rows_ - 1, std::max(cols_ - 5, 0), mode, status);
+
+    if (calendar_) {
+        for (const Layout& l : last_layout_)
+            if (l.control->name() == calendar_->control)
+                if (const auto place = calendar_place(l, rows_, cols_)) draw_calendar(canvas, *place);
+    }
+    if (list_) {
+        for (const Layout& l : last_layout_)
+            if (l.control->name() == list_->control) draw_list(canvas, list_rect(l, rows_));
+    }
 }
 
 std::string TerminalSession::values_json() { return record_json(form_); }

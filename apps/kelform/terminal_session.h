@@ -62,7 +62,7 @@ public:
     // The values as the form reads them through Text, one member per control: the record.
     std::string values_json();
 
-    // For tests and the screen: the status line's message, the events pane's lines.
+    // For tests and the screen: the status line's message (UTF-8), the events pane's lines.
     const std::string& status() const { return status_; }
     const std::deque<std::string>& events() const { return events_; }
     bool events_shown() const { return events_shown_; }
@@ -100,6 +100,7 @@ private:
     void keys_sent(mini::HostedControl& control, std::string_view keys) override;
     void handler_error(std::string_view where, int number) override;
 
+    Outcome handle_input(const Input& input);
     Outcome handle_key(int16_t key, int16_t shift);
     void handle_character(char32_t ch);
     void handle_click(int row, int col);
@@ -129,10 +130,16 @@ private:
     // The saved controls that may show on the screen as it is scrolled now, in file order.
     std::vector<std::size_t> on_screen() const;
     std::vector<Layout> layout();
-    Rect calendar_rect(const Layout& box, int rows, int cols) const;
+    // Where the calendar stands: framed where there is room, else without its frame (8 rows),
+    // never over its own field; nothing when no place on the screen keeps the field clear.
+    struct CalendarPlace {
+        Rect rect;
+        int inset = 1;  // 1 inside the frame, 0 without one
+    };
+    std::optional<CalendarPlace> calendar_place(const Layout& box, int rows, int cols) const;
     Rect list_rect(const Layout& box, int rows) const;
     void draw_control(Canvas& canvas, const Layout& l, bool focused);
-    void draw_calendar(Canvas& canvas, const Rect& r);
+    void draw_calendar(Canvas& canvas, const CalendarPlace& place);
     void draw_list(Canvas& canvas, const Rect& r);
 
     std::string label_of(const mini::HostedControl& control) const;
@@ -150,11 +157,14 @@ private:
     std::map<std::string, int> scroll_;  // first text position shown, per control
     int rows_ = 24, cols_ = 80;          // the size last drawn, for clicks
     int top_ = 0;                        // form rows scrolled off the top
+    int max_row_ = 1;                    // the form's last row
+    int min_cols_ = 20;                  // the narrowest screen that shows every field
     std::vector<Layout> last_layout_;
     std::optional<std::string> record_path_;
     RecordWriter write_record_;
     std::vector<std::string> saved_values_;  // raw_values() when last saved or opened
     bool confirm_quit_ = false;              // "Discard changes? y/n" is asked
+    bool left_field_ = false;                // this input made focus leave the field (and maybe return)
     // Forms may hold thousands of controls: a redraw looks at the rows on the screen, and names
     // are found through a map, so that a keystroke costs the same however long the form is.
     std::unordered_map<std::string, std::size_t> saved_index_;  // name_key -> saved_.controls

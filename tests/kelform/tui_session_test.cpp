@@ -160,12 +160,52 @@ TEST_F(SessionTest, StatusLineExplainsRefusedKeys) {
     key(mini::kVkTab, kShiftMask);
     key(mini::kVkTab, kShiftMask);
     ASSERT_EQ(focused(), "Payee");
-    type(U"\u0101");
-    EXPECT_NE(session->status().find("cannot be typed"), std::string::npos) << session->status();
+    type(U"\u65e5");
+    EXPECT_EQ(session->status(), "'\u65e5' cannot be typed here: the form holds Windows-1252 text");
+    EXPECT_NE(row(23).find("'\u65e5' cannot"), std::string::npos) << row(23);
     EXPECT_EQ(text("Payee"), Variant(""));
     type(U"\u00e9\u20ac");
     EXPECT_EQ(text("Payee"), Variant("\xC9\x80"));
     EXPECT_NE(row(kPayeeRow).find("\u00c9\u20ac"), std::string::npos) << row(kPayeeRow);
+}
+
+TEST_F(SessionTest, TheFormSaysWhenLeavingChangedTheValueTyped) {
+    tab(2);
+    type(U"6000000");  // above the largest amount: clamped
+    tab();
+    EXPECT_EQ(session->status(), "Amount: 6000000 was changed to 5000000.00");
+    type(U"31/04/2026");  // no 31 April: corrected
+    tab();
+    EXPECT_EQ(session->status(), "Voucher date: 31/04/2026 was changed to 30/04/2026");
+    key(mini::kVkTab, kShiftMask);
+    type(U"5/8/26");  // only completed: no change of value
+    key(mini::kVkTab, kShiftMask);
+    EXPECT_EQ(session->status(), "");
+    type(U"2500");  // only grouped and padded
+    tab();
+    EXPECT_EQ(session->status(), "");
+}
+
+TEST_F(SessionTest, SmallScreensScrollAndSaySoWhenTooSmall) {
+    tab(6);
+    ASSERT_EQ(focused(), "Period");
+    EXPECT_EQ(screen(10, 80).row_text(1).find("Payee"), std::string::npos);  // scrolled away
+    EXPECT_NE(screen(30, 80).row_text(kPayeeRow).find("Payee name"), std::string::npos);  // back on growing
+    EXPECT_EQ(screen(5, 20).row_text(0), "Terminal too small");
+    // On a 40x10 screen the calendar stands clear of its field, its last row on the screen.
+    tab(5);  // the blank period keeps focus once
+    ASSERT_EQ(focused(), "VoucherDate");
+    key(kF4);
+    ASSERT_TRUE(session->calendar_open());
+    Canvas c = screen(10, 40);
+    int field_row = -1, last_week = -1;
+    for (int r = 0; r < c.rows(); ++r) {
+        if (c.row_text(r).find("Voucher date") != std::string::npos) field_row = r;
+        if (c.row_text(r).find("28 29 30 31") != std::string::npos) last_week = r;
+    }
+    EXPECT_GE(field_row, 1);
+    EXPECT_NE(c.row_text(field_row).find("06/12/2026"), std::string::npos) << c.row_text(field_row);
+    EXPECT_GT(last_week, field_row);
 }
 
 TEST_F(SessionTest, InsertTogglesOverwriteShownOnTheStatusLine) {
