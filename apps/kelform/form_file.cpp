@@ -429,6 +429,9 @@ Variant setting_value(std::string_view literal, Date today) {
 
 void open_form(mini::Form& form, const SavedForm& saved, std::span<const ClassInfo> classes, const std::string& file,
                Date today) {
+    std::vector<mini::HostedControl*> loaded;
+    loaded.reserve(saved.controls.size());
+    form.reserve(saved.controls.size());
     for (const SavedControl& c : saved.controls) {
         const ClassInfo* cls = find_class(classes, c.class_name);
         if (!cls) throw FormFileError(file, c.line, "unknown class '" + c.class_name + "'");
@@ -437,6 +440,7 @@ void open_form(mini::Form& form, const SavedForm& saved, std::span<const ClassIn
             // form: some controls set their own width while they read their properties.
             mini::HostedControl& hosted = form.load(*cls, c.name, c.stored, c.width, c.height);
             form.resize(hosted, c.width, c.height);
+            loaded.push_back(&hosted);
         } catch (const RuntimeError& e) {
             throw FormFileError(file, c.line, c.name + " could not load its stored values: error " +
                                                   std::to_string(e.number()) + " (" + e.what() + ")");
@@ -444,9 +448,8 @@ void open_form(mini::Form& form, const SavedForm& saved, std::span<const ClassIn
             throw FormFileError(file, c.line, e.what());
         }
     }
-    for (const SavedControl& c : saved.controls) {
-        mini::HostedControl* hosted = form.find(c.name);
-        if (!hosted) continue;
+    for (std::size_t i = 0; i < saved.controls.size(); ++i) {
+        const SavedControl& c = saved.controls[i];
         for (const OpenSetting& s : c.settings) {
             Variant value;
             try {
@@ -455,7 +458,7 @@ void open_form(mini::Form& form, const SavedForm& saved, std::span<const ClassIn
                 throw FormFileError(file, s.line, e.what());
             }
             try {
-                hosted->dispatch().set(s.property, value);
+                loaded[i]->dispatch().set(s.property, value);
             } catch (const RuntimeError& e) {
                 throw FormFileError(file, s.line, c.name + "." + s.property + " -> error " +
                                                       std::to_string(e.number()) + " (" + e.what() + ")");
@@ -467,14 +470,22 @@ void open_form(mini::Form& form, const SavedForm& saved, std::span<const ClassIn
 SavedForm capture_form(mini::Form& form, const SavedForm& saved) {
     SavedForm out = saved;
     int next_row = 1;
+    for (const SavedControl& c : out.controls) next_row = std::max(next_row, c.row + 2);
+    // A form opened from the file holds its controls in the file's order: each is found in
+    // its own place, and the map of names is only built when one is not.
     std::unordered_map<std::string, std::size_t> index;  // name_key -> place in out.controls
-    for (std::size_t i = 0; i < out.controls.size(); ++i) {
-        next_row = std::max(next_row, out.controls[i].row + 2);
-        index.try_emplace(name_key(out.controls[i].name), i);
-    }
+    const auto place_of = [&](const std::string& name, std::size_t expected) -> std::optional<std::size_t> {
+        if (expected < out.controls.size() && same_name(out.controls[expected].name, name)) return expected;
+        if (index.empty())
+            for (std::size_t i = 0; i < out.controls.size(); ++i) index.try_emplace(name_key(out.controls[i].name), i);
+        const auto it = index.find(name_key(name));
+        if (it == index.end()) return std::nullopt;
+        return it->second;
+    };
+    std::size_t expected = 0;
     for (mini::HostedControl* hosted : form.controls()) {
-        auto [it, added] = index.try_emplace(name_key(hosted->name()), out.controls.size());
-        if (added) {
+        std::optional<std::size_t> place = place_of(hosted->name(), expected);
+        if (!place) {
             SavedControl c;
             c.class_name = hosted->info().name;
             c.name = hosted->name();
@@ -485,9 +496,12 @@ SavedForm capture_form(mini::Form& form, const SavedForm& saved) {
             mini::Part& surface = hosted->surface_part();
             c.width = static_cast<float>(surface.peek("Width").number());
             c.height = static_cast<float>(surface.peek("Height").number());
+            place = out.controls.size();
+            if (!index.empty()) index.emplace(name_key(c.name), *place);
             out.controls.push_back(std::move(c));
         }
-        out.controls[it->second].stored = form.save(*hosted);
+        out.controls[*place].stored = form.save(*hosted);
+        expected = *place + 1;
     }
     return out;
 }
