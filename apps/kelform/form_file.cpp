@@ -8,13 +8,13 @@
 #include <filesystem>
 #include <fstream>
 #include <limits>
-#include <sstream>
 #include <system_error>
 #include <unordered_map>
 #include <unordered_set>
 
 #include "apps/kelform/script_player.h"
 #include "apps/kelform/script_syntax.h"
+#include "apps/kelform/text_file.h"
 #include "keltext/host/charset.h"
 #include "keltext/host/conversions.h"
 #include "keltext/host/font.h"
@@ -351,15 +351,16 @@ SavedForm parse_form(std::string_view text, const std::string& file, std::span<c
     return Parser(file, classes).parse(text);
 }
 
-SavedForm read_form_file(const std::string& path, std::span<const ClassInfo> classes) {
+SavedForm read_form_file(const std::string& path, std::span<const ClassInfo> classes, std::size_t max_bytes) {
     std::error_code ec;
     if (std::filesystem::is_directory(path, ec)) throw FormFileError(path, 0, "is a directory, not a form file");
-    std::ifstream in(path, std::ios::binary);
-    if (!in) throw FormFileError(path, 0, "cannot open the file");
-    std::ostringstream text;
-    text << in.rdbuf();
-    if (in.bad()) throw FormFileError(path, 0, "cannot read the file");
-    return parse_form(text.str(), path, classes);
+    std::string text;
+    try {
+        text = decode_text(read_limited(path, max_bytes));
+    } catch (const TextFileError& e) {
+        throw FormFileError(path, e.line(), e.what());
+    }
+    return parse_form(text, path, classes);
 }
 
 std::string write_form(const SavedForm& form) {
@@ -513,7 +514,7 @@ Date local_today() {
     return make_date(local.tm_year + 1900, local.tm_mon + 1, local.tm_mday).value_or(Date{});
 }
 
-void add_form_commands(Player& player, std::span<const ClassInfo> classes) {
+void add_form_commands(Player& player, std::span<const ClassInfo> classes, std::size_t max_file_bytes) {
     // The form file the script's form was loaded from, shared by the two commands of this player.
     auto saved = std::make_shared<SavedForm>();
     saved->title = "Form";
@@ -522,10 +523,10 @@ void add_form_commands(Player& player, std::span<const ClassInfo> classes) {
         a.finish();
         return is_string_literal(word) ? decode_string(word) : std::string(word);
     };
-    player.add_command("loadform", [saved, classes, file_arg](Player& p, Args& a) {
+    player.add_command("loadform", [saved, classes, file_arg, max_file_bytes](Player& p, Args& a) {
         const std::string file = file_arg(a);
         try {
-            SavedForm loaded = read_form_file(file, classes);
+            SavedForm loaded = read_form_file(file, classes, max_file_bytes);
             open_form(p.form(), loaded, classes, file, local_today());
             if (saved->controls.empty()) {
                 *saved = std::move(loaded);

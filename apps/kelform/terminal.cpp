@@ -9,6 +9,7 @@
 
 #include "apps/kelform/demo_form.h"
 #include "apps/kelform/form_file.h"
+#include "apps/kelform/play.h"
 #include "apps/kelform/terminal_session.h"
 #include "apps/kelform/tui.h"
 #include "keltext/library/catalogue.h"
@@ -36,10 +37,12 @@ int run_terminal(int argc, char** argv) {
     Catalogue catalogue;
     const std::string name = path ? *path : std::string(kDemoFormName);
     const Date today = local_today();
+    const std::optional<std::size_t> limit = max_file_bytes_setting(std::cerr);
+    if (!limit) return 2;
     SavedForm saved;
     mini::Form form;
     try {
-        saved = path ? read_form_file(*path, catalogue.classes())
+        saved = path ? read_form_file(*path, catalogue.classes(), *limit)
                     : parse_form(demo_form_text(), name, catalogue.classes());
         open_form(form, saved, catalogue.classes(), name, today);
     } catch (const FormFileError& e) {
