@@ -9,7 +9,6 @@
 #include <filesystem>
 #include <fstream>
 #include <limits>
-#include <sstream>
 #include <system_error>
 #include <unordered_map>
 #include <unordered_set>
@@ -17,6 +16,7 @@
 #include "apps/kelform/safe_file.h"
 #include "apps/kelform/script_player.h"
 #include "apps/kelform/script_syntax.h"
+#include "apps/kelform/text_file.h"
 #include "keltext/host/charset.h"
 #include "keltext/host/conversions.h"
 #include "keltext/host/font.h"
@@ -355,15 +355,16 @@ SavedForm parse_form(std::string_view text, const std::string& file, std::span<c
     return Parser(file, classes).parse(text);
 }
 
-SavedForm read_form_file(const std::string& path, std::span<const ClassInfo> classes) {
+SavedForm read_form_file(const std::string& path, std::span<const ClassInfo> classes, std::size_t max_bytes) {
     std::error_code ec;
     if (std::filesystem::is_directory(path, ec)) throw FormFileError(path, 0, "is a directory, not a form file");
-    std::ifstream in(path, std::ios::binary);
-    if (!in) throw FormFileError(path, 0, "cannot open the file");
-    std::ostringstream text;
-    text << in.rdbuf();
-    if (in.bad()) throw FormFileError(path, 0, "cannot read the file");
-    return parse_form(text.str(), path, classes);
+    std::string text;
+    try {
+        text = decode_text(read_limited(path, max_bytes));
+    } catch (const TextFileError& e) {
+        throw FormFileError(path, e.line(), e.what());
+    }
+    return parse_form(text, path, classes);
 }
 
 std::string write_form(const SavedForm& form) {
@@ -467,6 +468,9 @@ void check_stored(mini::HostedControl& hosted, const SavedControl& c, const std:
 
 void open_form(mini::Form& form, const SavedForm& saved, std::span<const ClassInfo> classes, const std::string& file,
                Date today) {
+    std::vector<mini::HostedControl*> loaded;
+    loaded.reserve(saved.controls.size());
+    form.reserve(saved.controls.size());
     for (const SavedControl& c : saved.controls) {
         const ClassInfo* cls = find_class(classes, c.class_name);
         if (!cls) throw FormFileError(file, c.line, "unknown class '" + c.class_name + "'");
@@ -476,6 +480,7 @@ void open_form(mini::Form& form, const SavedForm& saved, std::span<const ClassIn
             mini::HostedControl& hosted = form.load(*cls, c.name, c.stored, c.width, c.height);
             check_stored(hosted, c, file);
             form.resize(hosted, c.width, c.height);
+            loaded.push_back(&hosted);
         } catch (const RuntimeError& e) {
             throw FormFileError(file, c.line, c.name + " could not load its stored values: error " +
                                                   std::to_string(e.number()) + " (" + e.what() + ")");
@@ -483,9 +488,8 @@ void open_form(mini::Form& form, const SavedForm& saved, std::span<const ClassIn
             throw FormFileError(file, c.line, e.what());
         }
     }
-    for (const SavedControl& c : saved.controls) {
-        mini::HostedControl* hosted = form.find(c.name);
-        if (!hosted) continue;
+    for (std::size_t i = 0; i < saved.controls.size(); ++i) {
+        const SavedControl& c = saved.controls[i];
         for (const OpenSetting& s : c.settings) {
             Variant value;
             try {
@@ -494,7 +498,7 @@ void open_form(mini::Form& form, const SavedForm& saved, std::span<const ClassIn
                 throw FormFileError(file, s.line, e.what());
             }
             try {
-                hosted->dispatch().set(s.property, value);
+                loaded[i]->dispatch().set(s.property, value);
             } catch (const RuntimeError& e) {
                 throw FormFileError(file, s.line, c.name + "." + s.property + " -> error " +
                                                       std::to_string(e.number()) + " (" + e.what() + ")");
@@ -506,14 +510,22 @@ void open_form(mini::Form& form, const SavedForm& saved, std::span<const ClassIn
 SavedForm capture_form(mini::Form& form, const SavedForm& saved) {
     SavedForm out = saved;
     int next_row = 1;
+    for (const SavedControl& c : out.controls) next_row = std::max(next_row, c.row + 2);
+    // A form opened from the file holds its controls in the file's order: each is found in
+    // its own place, and the map of names is only built when one is not.
     std::unordered_map<std::string, std::size_t> index;  // name_key -> place in out.controls
-    for (std::size_t i = 0; i < out.controls.size(); ++i) {
-        next_row = std::max(next_row, out.controls[i].row + 2);
-        index.try_emplace(name_key(out.controls[i].name), i);
-    }
+    const auto place_of = [&](const std::string& name, std::size_t expected) -> std::optional<std::size_t> {
+        if (expected < out.controls.size() && same_name(out.controls[expected].name, name)) return expected;
+        if (index.empty())
+            for (std::size_t i = 0; i < out.controls.size(); ++i) index.try_emplace(name_key(out.controls[i].name), i);
+        const auto it = index.find(name_key(name));
+        if (it == index.end()) return std::nullopt;
+        return it->second;
+    };
+    std::size_t expected = 0;
     for (mini::HostedControl* hosted : form.controls()) {
-        auto [it, added] = index.try_emplace(name_key(hosted->name()), out.controls.size());
-        if (added) {
+        std::optional<std::size_t> place = place_of(hosted->name(), expected);
+        if (!place) {
             SavedControl c;
             c.class_name = hosted->info().name;
             c.name = hosted->name();
@@ -524,9 +536,12 @@ SavedForm capture_form(mini::Form& form, const SavedForm& saved) {
             mini::Part& surface = hosted->surface_part();
             c.width = static_cast<float>(surface.peek("Width").number());
             c.height = static_cast<float>(surface.peek("Height").number());
+            place = out.controls.size();
+            if (!index.empty()) index.emplace(name_key(c.name), *place);
             out.controls.push_back(std::move(c));
         }
-        out.controls[it->second].stored = form.save(*hosted);
+        out.controls[*place].stored = form.save(*hosted);
+        expected = *place + 1;
     }
     return out;
 }
@@ -554,7 +569,7 @@ Date local_today() {
     return make_date(local.tm_year + 1900, local.tm_mon + 1, local.tm_mday).value_or(Date{});
 }
 
-void add_form_commands(Player& player, std::span<const ClassInfo> classes) {
+void add_form_commands(Player& player, std::span<const ClassInfo> classes, std::size_t max_file_bytes) {
     // The form file the script's form was loaded from, shared by the two commands of this player.
     auto saved = std::make_shared<SavedForm>();
     saved->title = "Form";
@@ -563,10 +578,10 @@ void add_form_commands(Player& player, std::span<const ClassInfo> classes) {
         a.finish();
         return is_string_literal(word) ? decode_string(word) : std::string(word);
     };
-    player.add_command("loadform", [saved, classes, file_arg](Player& p, Args& a) {
+    player.add_command("loadform", [saved, classes, file_arg, max_file_bytes](Player& p, Args& a) {
         const std::string file = file_arg(a);
         try {
-            SavedForm loaded = read_form_file(file, classes);
+            SavedForm loaded = read_form_file(file, classes, max_file_bytes);
             open_form(p.form(), loaded, classes, file, local_today());
             if (saved->controls.empty()) {
                 *saved = std::move(loaded);

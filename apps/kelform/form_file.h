@@ -4,6 +4,7 @@
 // values its WriteProperties stored (exactly those, so that ReadProperties reads them back),
 // and the settings the form's code makes when the form opens. docs/kelform.md describes the
 // format.
+#include <cstddef>
 #include <optional>
 #include <span>
 #include <stdexcept>
@@ -11,6 +12,7 @@
 #include <string_view>
 #include <vector>
 
+#include "apps/kelform/text_file.h"
 #include "keltext/host/date.h"
 #include "keltext/host/variant.h"
 #include "keltext/host/members.h"
@@ -72,8 +74,10 @@ struct SavedForm {
 // Parses a form file. `file` names it in error messages. Class names are checked against the
 // classes given (property pages cannot stand on a form), and so are the properties of `set`.
 SavedForm parse_form(std::string_view text, const std::string& file, std::span<const ClassInfo> classes);
-// Reads and parses a file (FormFileError with line 0 when it cannot be read).
-SavedForm read_form_file(const std::string& path, std::span<const ClassInfo> classes);
+// Reads and parses a file of at most `max_bytes` (FormFileError with line 0 when it cannot be
+// read or is larger). A file that starts with the UTF-8 byte-order mark is decoded from UTF-8.
+SavedForm read_form_file(const std::string& path, std::span<const ClassInfo> classes,
+                         std::size_t max_bytes = kDefaultMaxFileBytes);
 
 // The text of a form file; parse_form of it gives the same form back.
 std::string write_form(const SavedForm& form);
@@ -114,6 +118,7 @@ SavedForm capture_form(mini::Form& form, const SavedForm& saved);
 class Player;
 // Adds `loadform FILE` and `saveform FILE` to a script player. Both remember the form file
 // between them, so that a form loaded and saved again keeps its title, labels and places.
-void add_form_commands(Player& player, std::span<const ClassInfo> classes);
+void add_form_commands(Player& player, std::span<const ClassInfo> classes,
+                       std::size_t max_file_bytes = kDefaultMaxFileBytes);
 
 }  // namespace kel::kelform

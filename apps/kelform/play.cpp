@@ -1,58 +1,42 @@
 #include "apps/kelform/play.h"
 
-#include <cstdio>
-#include <iterator>
+#include <cstdlib>
 #include <memory>
 #include <optional>
 #include <string>
 
 #include "apps/kelform/form_file.h"
+#include "apps/kelform/text_file.h"
 #include "apps/kelform/version.h"
 #include "keltext/library/catalogue.h"
 
 namespace kel::kelform {
 namespace {
 
-struct FileCloser {
-    void operator()(std::FILE* f) const { std::fclose(f); }
-};
-
-// The whole file, or nothing when it cannot be read (a directory opens but does not read).
-std::optional<std::string> read_file(const std::string& path) {
-    std::unique_ptr<std::FILE, FileCloser> f(std::fopen(path.c_str(), "rb"));
-    if (!f) return std::nullopt;
-    std::string text;
-    char buf[65536];
-    std::size_t n;
-    while ((n = std::fread(buf, 1, sizeof buf, f.get())) > 0) text.append(buf, n);
-    if (std::ferror(f.get())) return std::nullopt;
-    return text;
-}
-
-std::optional<std::string> read_stream(std::istream& in) {
-    std::string text{std::istreambuf_iterator<char>(in), std::istreambuf_iterator<char>()};
-    if (in.bad()) return std::nullopt;
-    return text;
-}
-
 }  // namespace
 
 int play(std::span<const std::string_view> scripts, std::span<const ClassInfo> classes, std::istream& in,
-         std::ostream& out, std::ostream& err, const PlayerSetup& setup) {
+         std::ostream& out, std::ostream& err, const PlayerSetup& setup, std::size_t max_file_bytes) {
     int status = 0;
     for (std::string_view script : scripts) {
         bool from_stdin = script == "-";
         std::string name = from_stdin ? "<stdin>" : std::string(script);
-        std::optional<std::string> text = from_stdin ? read_stream(in) : read_file(name);
-        if (!text) {
+        std::string text;
+        try {
+            text = decode_text(from_stdin ? read_limited(in, max_file_bytes) : read_limited(name, max_file_bytes));
+        } catch (const TextFileError& e) {
             out.flush();
-            err << name << ": cannot read the script\n";
+            switch (e.fault()) {
+                case TextFileError::Fault::unreadable: err << name << ": cannot read the script\n"; break;
+                case TextFileError::Fault::too_large: err << name << ": " << e.what() << '\n'; break;
+                case TextFileError::Fault::bad_text: err << name << ':' << e.line() << ": " << e.what() << '\n'; break;
+            }
             status = 2;
             continue;
         }
         Player player(classes, out);
         if (setup) setup(player);
-        int s = player.run_script(*text, name, err);
+        int s = player.run_script(text, name, err);
         if (s > status) status = s;
     }
     out.flush();
@@ -64,9 +48,21 @@ int play_command(std::span<const std::string_view> args, std::istream& in, std::
         err << "kelform play: no script given (usage: kelform play SCRIPT.kfs ...)\n";
         return 2;
     }
+    const std::optional<std::size_t> limit = max_file_bytes_setting(err);
+    if (!limit) return 2;
     Catalogue catalogue;
-    return play(args, catalogue.classes(), in, out, err,
-                [&catalogue](Player& p) { add_form_commands(p, catalogue.classes()); });
+    return play(
+        args, catalogue.classes(), in, out, err,
+        [&catalogue, limit](Player& p) { add_form_commands(p, catalogue.classes(), *limit); }, *limit);
+}
+
+std::optional<std::size_t> max_file_bytes_setting(std::ostream& err) {
+    const char* setting = std::getenv(kMaxFileBytesVariable);
+    if (!setting) return kDefaultMaxFileBytes;
+    if (const auto limit = parse_max_file_bytes(setting)) return limit;
+    err << "kelform: " << kMaxFileBytesVariable << " must be a whole number of bytes above 0, not '" << setting
+        << "'\n";
+    return std::nullopt;
 }
 
 void print_usage(std::ostream& out) {

@@ -7,9 +7,7 @@
 #include <cstdio>
 #include <cstring>
 #include <filesystem>
-#include <fstream>
 #include <iostream>
-#include <sstream>
 #include <string>
 #include <string_view>
 
@@ -19,6 +17,7 @@
 #include "apps/kelform/record.h"
 #include "apps/kelform/safe_file.h"
 #include "apps/kelform/terminal_session.h"
+#include "apps/kelform/text_file.h"
 #include "apps/kelform/tui.h"
 #include "keltext/library/catalogue.h"
 #include "keltext/minihost/form.h"
@@ -92,21 +91,6 @@ std::string record_problem(const std::string& path) {
     return {};
 }
 
-std::optional<std::string> read_whole(const std::string& path, std::string& error) {
-    std::ifstream in(path, std::ios::binary);
-    if (!in) {
-        error = path + ": " + std::strerror(errno);
-        return std::nullopt;
-    }
-    std::ostringstream text;
-    text << in.rdbuf();
-    if (in.bad()) {
-        error = path + ": cannot be read";
-        return std::nullopt;
-    }
-    return text.str();
-}
-
 }  // namespace
 
 void print_run_usage(std::ostream& out) {
@@ -138,12 +122,14 @@ int run_terminal(std::span<const std::string_view> args) {
     // file is reported on a plain terminal, and a bad record is never overwritten.
     Catalogue catalogue;
     const std::string name = path ? *path : std::string(kDemoFormName);
+    const std::optional<std::size_t> limit = max_file_bytes_setting(std::cerr);
+    if (!limit) return 2;
     Date today;
     SavedForm saved;
     mini::Form form;
     try {
         today = local_today();
-        saved = path ? read_form_file(*path, catalogue.classes())
+        saved = path ? read_form_file(*path, catalogue.classes(), *limit)
                     : parse_form(demo_form_text(), name, catalogue.classes());
         open_form(form, saved, catalogue.classes(), name, today);
     } catch (const FormFileError& e) {
@@ -154,13 +140,11 @@ int run_terminal(std::span<const std::string_view> args) {
     if (options->record) {
         std::error_code ec;
         if (std::filesystem::exists(*options->record, ec)) {
-            const auto text = read_whole(*options->record, error);
-            if (!text) {
-                std::cerr << "kelform: " << error << '\n';
-                return 2;
-            }
             try {
-                load_record(form, *text, *options->record);
+                load_record(form, read_limited(*options->record, *limit), *options->record);
+            } catch (const TextFileError& e) {
+                std::cerr << "kelform: " << e.what() << '\n';
+                return 2;
             } catch (const RecordError& e) {
                 std::cerr << e.what() << '\n';
                 return 2;

@@ -37,9 +37,11 @@ constexpr const char* kMonthNames[] = {"January", "February", "March",     "Apri
 
 int cells(double twips) { return static_cast<int>(std::lround(twips / kTwipsPerCell)); }
 
-// Reads a member of a part, or nothing when the part lacks it or refuses the read.
+// Reads a member of a part, or nothing when the part lacks it or refuses the read. Every redraw
+// reads a dozen members of each field on the screen: a part that lacks the member refuses the
+// read, which costs less than listing its members first.
 std::optional<Variant> peek(const Part* part, std::string_view member) {
-    if (!part || !mini::find_member(*part, member)) return std::nullopt;
+    if (!part) return std::nullopt;
     try {
         return part->peek(member);
     } catch (const RuntimeError&) {
@@ -100,16 +102,22 @@ TerminalSession::TerminalSession(mini::Form& form, const SavedForm& saved, Date 
     for (std::size_t i = 0; i < saved_.controls.size(); ++i) {
         const SavedControl& c = saved_.controls[i];
         saved_index_.try_emplace(name_key(c.name), i);
-        // A control stands on its field's row, and on its label's where that is placed apart.
-        const auto stands_on = [&](int row) {
+        hosted_.push_back(form_.find(c.name));
+        // A control stands on its field's row (its label before it, unless placed apart), and on
+        // its label's row where that is placed apart.
+        const bool label_apart = c.label_row && c.label_col;
+        const auto stands_on = [&](int row, int left) {
             if (row < 1) return;
             const auto r = static_cast<std::size_t>(row);
             if (by_row_.size() <= r) by_row_.resize(r + 1);
-            by_row_[r].push_back(i);
+            by_row_[r].push_back({left, i});
         };
-        stands_on(c.row);
-        if (c.label_row && *c.label_row != c.row) stands_on(*c.label_row);
+        int left = label_apart ? c.col - 1 : c.col - 2 - static_cast<int>(c.label.size());
+        if (label_apart && *c.label_row == c.row) left = std::min(left, *c.label_col - 1);
+        stands_on(c.row, left);
+        if (label_apart && *c.label_row != c.row) stands_on(*c.label_row, *c.label_col - 1);
     }
+    for (auto& row : by_row_) std::sort(row.begin(), row.end());
     for (const SavedControl& c : saved_.controls) max_row_ = std::max({max_row_, c.row, c.label_row.value_or(c.row)});
     // Every field must show its first cells: where the furthest one starts, and a little more.
     for (const SavedControl& c : saved_.controls) min_cols_ = std::max(min_cols_, c.col - 1 + kMinFieldCells);
@@ -685,14 +693,10 @@ std::vector<std::size_t> TerminalSession::on_screen() const {
     std::vector<std::size_t> out;
     const int last = top_ + std::max(rows_ - 3, 1);
     for (int row = top_ + 1; row <= last && row < static_cast<int>(by_row_.size()); ++row)
-        for (std::size_t i : by_row_[static_cast<std::size_t>(row)]) {
+        for (const OnRow& c : by_row_[static_cast<std::size_t>(row)]) {
             // The form does not scroll sideways: what starts past the right edge never shows.
-            const SavedControl& c = saved_.controls[i];
-            const bool label_apart = c.label_row && c.label_col;
-            int left = cols_;
-            if (c.row == row) left = label_apart ? c.col - 1 : c.col - 2 - static_cast<int>(c.label.size());
-            if (label_apart && *c.label_row == row) left = std::min(left, *c.label_col - 1);
-            if (left < cols_) out.push_back(i);
+            if (c.left >= cols_) break;
+            out.push_back(c.index);
         }
     // The focused control, and the one whose list or calendar is open, are laid out wherever
     // they stand: the cursor and the pop-ups are placed from them.
@@ -711,7 +715,7 @@ std::vector<TerminalSession::Layout> TerminalSession::layout() {
     std::vector<Layout> out;
     for (const std::size_t i : on_screen()) {
         const SavedControl& saved = saved_.controls[i];
-        HostedControl* c = form_.find(saved.name);
+        HostedControl* c = hosted_[i];
         if (!c) continue;
         Layout l;
         l.control = c;

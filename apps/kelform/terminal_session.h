@@ -168,7 +168,13 @@ private:
     // Forms may hold thousands of controls: a redraw looks at the rows on the screen, and names
     // are found through a map, so that a keystroke costs the same however long the form is.
     std::unordered_map<std::string, std::size_t> saved_index_;  // name_key -> saved_.controls
-    std::vector<std::vector<std::size_t>> by_row_;              // form row -> controls on it
+    std::vector<mini::HostedControl*> hosted_;                  // saved_.controls[i] on the form
+    struct OnRow {
+        int left;           // the first screen column the control uses on that row
+        std::size_t index;  // in saved_.controls
+        bool operator<(const OnRow& o) const { return left < o.left || (left == o.left && index < o.index); }
+    };
+    std::vector<std::vector<OnRow>> by_row_;  // form row -> controls on it, from the left
 };
 
 }  // namespace kel::kelform

@@ -77,48 +77,52 @@ std::string to_utf8(std::string_view cp1252) {
     return out;
 }
 
+Utf8Unit next_utf8(std::string_view utf8, size_t at) {
+    const size_t n = utf8.size();
+    auto byte = [&](size_t k) { return static_cast<uint8_t>(utf8[k]); };
+    const uint8_t lead = byte(at);
+    char32_t cp = 0;
+    size_t len = 0;
+    char32_t min = 0;
+    if (lead < 0x80) {
+        cp = lead;
+        len = 1;
+    } else if (lead >= 0xC2 && lead <= 0xDF) {
+        cp = lead & 0x1F;
+        len = 2;
+        min = 0x80;
+    } else if (lead >= 0xE0 && lead <= 0xEF) {
+        cp = lead & 0x0F;
+        len = 3;
+        min = 0x800;
+    } else if (lead >= 0xF0 && lead <= 0xF4) {
+        cp = lead & 0x07;
+        len = 4;
+        min = 0x10000;
+    }
+    // Take as many continuation bytes as the lead promises; a sequence cut short, overlong,
+    // a surrogate or beyond U+10FFFF is one malformed unit made of the bytes read so far.
+    size_t used = 1;
+    bool ok = len != 0;
+    while (ok && used < len) {
+        if (at + used >= n || (byte(at + used) & 0xC0) != 0x80) {
+            ok = false;
+            break;
+        }
+        cp = (cp << 6) | (byte(at + used) & 0x3F);
+        ++used;
+    }
+    if (ok && (cp < min || cp > 0x10FFFF || (cp >= 0xD800 && cp <= 0xDFFF))) ok = false;
+    return {ok ? std::optional<char32_t>(cp) : std::nullopt, used};
+}
+
 std::string from_utf8(std::string_view utf8, std::optional<char> replacement) {
     std::string out;
     out.reserve(utf8.size());
-    size_t i = 0;
-    const size_t n = utf8.size();
-    auto byte = [&](size_t k) { return static_cast<uint8_t>(utf8[k]); };
-    while (i < n) {
-        const uint8_t lead = byte(i);
-        char32_t cp = 0;
-        size_t len = 0;
-        char32_t min = 0;
-        if (lead < 0x80) {
-            cp = lead;
-            len = 1;
-        } else if (lead >= 0xC2 && lead <= 0xDF) {
-            cp = lead & 0x1F;
-            len = 2;
-            min = 0x80;
-        } else if (lead >= 0xE0 && lead <= 0xEF) {
-            cp = lead & 0x0F;
-            len = 3;
-            min = 0x800;
-        } else if (lead >= 0xF0 && lead <= 0xF4) {
-            cp = lead & 0x07;
-            len = 4;
-            min = 0x10000;
-        }
-        // Take as many continuation bytes as the lead promises; a sequence cut short, overlong,
-        // a surrogate or beyond U+10FFFF is one malformed unit made of the bytes read so far.
-        size_t used = 1;
-        bool ok = len != 0;
-        while (ok && used < len) {
-            if (i + used >= n || (byte(i + used) & 0xC0) != 0x80) {
-                ok = false;
-                break;
-            }
-            cp = (cp << 6) | (byte(i + used) & 0x3F);
-            ++used;
-        }
-        if (ok && (cp < min || cp > 0x10FFFF || (cp >= 0xD800 && cp <= 0xDFFF))) ok = false;
-        i += used;
-        const std::optional<uint8_t> b = ok ? from_unicode(cp) : std::nullopt;
+    for (size_t i = 0; i < utf8.size();) {
+        const Utf8Unit u = next_utf8(utf8, i);
+        i += u.used;
+        const std::optional<uint8_t> b = u.code_point ? from_unicode(*u.code_point) : std::nullopt;
         if (b) out += static_cast<char>(*b);
         else if (replacement) out += *replacement;
     }

@@ -1,6 +1,7 @@
 #pragma once
 // The host's single-byte character set, Windows-1252: one byte is one character and one caret
 // position. Front ends that speak UTF-8 convert at their boundary with these.
+#include <cstddef>
 #include <cstdint>
 #include <optional>
 #include <string>
@@ -23,6 +24,13 @@ std::optional<uint8_t> from_unicode(char32_t cp);
 std::string to_utf8(std::string_view cp1252);
 // Appends the UTF-8 form of any code point.
 void append_utf8(std::string& out, char32_t cp);
+// One character of UTF-8 text, from byte `at` (below the text's size): its code point, or
+// nothing when the bytes there are malformed, and how many bytes it takes (at least one).
+struct Utf8Unit {
+    std::optional<char32_t> code_point;
+    std::size_t used;
+};
+Utf8Unit next_utf8(std::string_view utf8, std::size_t at);
 // Characters the set lacks (and malformed UTF-8) are dropped, or replaced by `replacement`.
 std::string from_utf8(std::string_view utf8, std::optional<char> replacement = std::nullopt);
 

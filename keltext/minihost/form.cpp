@@ -35,7 +35,6 @@ public:
 
     MiniSite& site_of(HostedControl& c);
     MiniSite* find(std::string_view name);
-    void check_new_name(const std::string& name);
     MiniSite& add(const ClassInfo& cls, std::string name, float width, float height,
                   std::optional<std::vector<HostedControl*>> selected);
 
@@ -61,8 +60,7 @@ public:
     std::vector<std::unique_ptr<MiniSite>> sites_;
     // Forms may hold tens of thousands of controls: names and sites are found through maps,
     // never by a scan, so that loading, saving and each keystroke stay linear in the form.
-    std::unordered_map<std::string, MiniSite*> by_name_;            // name_key
-    std::unordered_map<const HostedControl*, std::size_t> place_;   // index in sites_
+    std::unordered_map<std::string, MiniSite*> by_name_;  // name_key -> site
     MiniSite* focused_ = nullptr;
     std::deque<SentKey> queue_;
     bool delivering_ = false;
@@ -86,9 +84,9 @@ void check_size(float width, float height) {
 }  // namespace
 
 MiniSite& FormImpl::site_of(HostedControl& c) {
-    const auto it = place_.find(&c);
-    if (it == place_.end()) throw FormError("control " + c.name() + " is not on this form");
-    return *sites_[it->second];
+    auto* s = dynamic_cast<MiniSite*>(&c);
+    if (!s || &s->form() != this) throw FormError("control " + c.name() + " is not on this form");
+    return *s;
 }
 
 MiniSite* FormImpl::find(std::string_view name) {
@@ -96,22 +94,19 @@ MiniSite* FormImpl::find(std::string_view name) {
     return it == by_name_.end() ? nullptr : it->second;
 }
 
-void FormImpl::check_new_name(const std::string& name) {
-    if (!valid_name(name)) throw FormError("bad control name '" + name + "': letters, digits and _ only");
-    if (find(name)) throw FormError("a control named " + name + " already exists");
-}
-
 MiniSite& FormImpl::add(const ClassInfo& cls, std::string name, float width, float height,
                         std::optional<std::vector<HostedControl*>> selected) {
-    check_new_name(name);
+    if (!valid_name(name)) throw FormError("bad control name '" + name + "': letters, digits and _ only");
+    std::string key = name_key(name);
+    if (by_name_.contains(key)) throw FormError("a control named " + name + " already exists");
     check_size(width, height);
     if (!cls.create) throw FormError("class " + cls.name + " cannot be created");
     auto site = std::make_unique<MiniSite>(*this, cls, std::move(name), width, height, std::move(selected));
     std::unique_ptr<Control> control = cls.create(*site);
     if (!control) throw FormError("class " + cls.name + " cannot be created");
     site->attach(std::move(control));
-    by_name_.emplace(name_key(site->name()), site.get());
-    place_.emplace(site.get(), sites_.size());
+    by_name_.emplace(std::move(key), site.get());
+    site->set_place(sites_.size());
     sites_.push_back(std::move(site));
     return *sites_.back();
 }
@@ -151,7 +146,7 @@ void FormImpl::tab(bool forward) {
     // that cannot take focus; without focus, Tab starts at the first and Shift+Tab at the last.
     const std::size_t n = sites_.size();
     if (n == 0) return;
-    std::size_t i = focused_ ? place_.at(focused_) : (forward ? n - 1 : 0);
+    std::size_t i = focused_ ? focused_->place() : (forward ? n - 1 : 0);
     const std::size_t steps = focused_ ? n - 1 : n;
     for (std::size_t step = 0; step < steps; ++step) {
         i = forward ? (i + 1) % n : (i + n - 1) % n;
@@ -273,6 +268,11 @@ StoredValues Form::save(HostedControl& control) {
 }
 
 HostedControl* Form::find(std::string_view name) { return impl_->find(name); }
+
+void Form::reserve(std::size_t more) {
+    impl_->sites_.reserve(impl_->sites_.size() + more);
+    impl_->by_name_.reserve(impl_->by_name_.size() + more);
+}
 
 std::vector<HostedControl*> Form::controls() {
     std::vector<HostedControl*> out;

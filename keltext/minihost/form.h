@@ -3,6 +3,7 @@
 // delivers keystrokes, clicks and notifications, queues synthetic keystrokes, loads and saves
 // property stores, and opens property pages. kelform (scripts and the terminal UI) and the
 // tests drive controls through it.
+#include <cstddef>
 #include <cstdint>
 #include <memory>
 #include <optional>
@@ -96,6 +97,8 @@ public:
     StoredValues save(HostedControl& control);
 
     HostedControl* find(std::string_view name);
+    // Room for `more` controls beyond those on the form, for a driver that loads many at once.
+    void reserve(std::size_t more);
     std::vector<HostedControl*> controls();  // tab order: order of creation, pages excluded
 
     // Opens a property page on the selected controls (item 0 first) and runs SelectionChanged.

@@ -99,6 +99,9 @@ public:
     static constexpr int kMaxHandlerDepth = 100;
 
     // For the form.
+    const FormServices& form() const { return form_; }
+    std::size_t place() const { return place_; }  // in creation order, from 0
+    void set_place(std::size_t place) { place_ = place; }
     bool is_page() const { return page_ != nullptr; }
     MiniSurface& mini_surface() { return surface_; }
     PagePart* page_part() { return page_.get(); }
@@ -130,6 +133,7 @@ private:
     std::unique_ptr<PagePart> page_;
     std::vector<std::pair<std::string, std::unique_ptr<InputPart>>> parts_;
     InputPart* keyboard_part_ = nullptr;
+    std::size_t place_ = 0;
     // Declared last, destroyed first: the control lets go of its constituents before they go.
     std::unique_ptr<Control> control_;
     std::unique_ptr<BoundControl> bound_;

@@ -1,6 +1,7 @@
 #pragma once
 // What every widget of the minimal host shares: handle, geometry, enabled and visible state,
 // the owner's handlers, member access by name, and the person's input as the form delivers it.
+#include <algorithm>
 #include <cmath>
 #include <cstdint>
 #include <exception>
@@ -139,11 +140,7 @@ public:
     void Height(float v) override { height_ = checked_extent(v); }
 
     // Part
-    std::vector<std::string> members() const override {
-        std::vector<std::string> m;
-        list_members(m);
-        return m;
-    }
+    std::vector<std::string> members() const override { return member_names(); }
     // An unknown member is error 438; an index given to a plain member, or missing for an
     // indexed one (List, ItemData), is 381. The members below see a checked index.
     Variant peek(std::string_view member, std::optional<int32_t> index = std::nullopt) const override {
@@ -166,7 +163,9 @@ public:
 
 protected:
     void check_member(std::string_view member, const std::optional<int32_t>& index) const {
-        if (!find_member(*this, member)) raise_error(kNoSuchMember);
+        const auto& names = member_names();
+        if (std::none_of(names.begin(), names.end(), [&](const std::string& n) { return same_name(n, member); }))
+            raise_error(kNoSuchMember);
         const bool indexed = same_name(member, "List") || same_name(member, "ItemData");
         if (indexed != index.has_value()) raise_error(kInvalidPropertyIndex);
     }
@@ -227,8 +226,16 @@ protected:
         if (h) guarded(down ? "MouseDown" : "MouseUp", [&] { h(button, shift, x, y); });
     }
 
+    // A widget's members never change: listed once, at the first read or write by name, since
+    // a redraw reads a dozen members of every field on the screen.
+    const std::vector<std::string>& member_names() const {
+        if (member_names_.empty()) list_members(member_names_);
+        return member_names_;
+    }
+
     WidgetContext& context_;
     std::string name_;
+    mutable std::vector<std::string> member_names_;
     WidgetEvents events_;
     int32_t handle_;
     bool enabled_ = true;

@@ -279,6 +279,20 @@ TEST_F(FormFileTest, FilesAreWrittenWholeAndReadBack) {
     EXPECT_THROW(read_form_file((dir / "missing.kform").string(), classes()), FormFileError);
     EXPECT_THROW(read_form_file((dir / "").string(), classes()), FormFileError);
     EXPECT_THROW(write_form_file((dir / "no" / "such" / "dir.kform").string(), saved), FormFileError);
+
+    // An editor's UTF-8 with its byte-order mark is read as UTF-8; a file past the limit is not read.
+    const std::string marked = (dir / "m.kform").string();
+    std::ofstream(marked, std::ios::binary) << "\xEF\xBB\xBF" "form \"Caf\xC3\xA9\"\n";
+    EXPECT_EQ(read_form_file(marked, classes()).title, "Caf\xE9");
+    EXPECT_THROW(read_form_file(marked, classes(), 10), FormFileError);
+    std::ofstream(marked, std::ios::binary) << "\xEF\xBB\xBF" "form \"F\"\ncontrol KelNumeric \xE4\xB8\xAD\n";
+    try {
+        read_form_file(marked, classes());
+        ADD_FAILURE() << "no error";
+    } catch (const FormFileError& e) {
+        EXPECT_EQ(std::string(e.what()),
+                  marked + ":2: the character U+4E2D cannot be held: the form's text is Windows-1252");
+    }
 }
 
 TEST_F(FormFileTest, ScriptsLoadAndSaveForms) {

@@ -46,6 +46,11 @@ TEST(PropertyStore, KeepsOnlyWhatDiffersInWriteOrder) {
     s.write("texttype", int16_t{0}, int16_t{0});
     ASSERT_EQ(s.values().size(), 2u);
     EXPECT_EQ(s.values()[0].first, "Forecolor");
+    // The values after the one taken out are still found, and rewritten in their place.
+    s.write("caption", "y", "");
+    EXPECT_EQ(s.read("Caption", ""), Variant("y"));
+    ASSERT_EQ(s.values().size(), 2u);
+    EXPECT_EQ(s.values()[1].second, Variant("y"));
 }
 
 TEST(PropertyStore, ReadsWithoutRegardToCaseAndGivesDefaults) {
