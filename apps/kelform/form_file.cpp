@@ -483,7 +483,7 @@ void open_form(mini::Form& form, const SavedForm& saved, std::span<const ClassIn
             loaded.push_back(&hosted);
         } catch (const RuntimeError& e) {
             throw FormFileError(file, c.line, c.name + " could not load its stored values: error " +
-                                                  std::to_string(e.number()) + " (" + e.what() + ")");
+                                                  std::to_string(e.number()) + " (" + error_description(e.number()) + ")");
         } catch (const mini::FormError& e) {
             throw FormFileError(file, c.line, e.what());
         }
@@ -501,7 +501,7 @@ void open_form(mini::Form& form, const SavedForm& saved, std::span<const ClassIn
                 loaded[i]->dispatch().set(s.property, value);
             } catch (const RuntimeError& e) {
                 throw FormFileError(file, s.line, c.name + "." + s.property + " -> error " +
-                                                      std::to_string(e.number()) + " (" + e.what() + ")");
+                                                      std::to_string(e.number()) + " (" + error_description(e.number()) + ")");
             }
         }
     }

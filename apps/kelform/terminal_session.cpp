@@ -330,7 +330,7 @@ TerminalSession::Outcome TerminalSession::handle_input(const Input& input) {
         }
     } catch (const RuntimeError& e) {
         // A run-time error that reached the form from one of its own calls: shown, not fatal.
-        say("error " + std::to_string(e.number()) + " (" + e.what() + ")");
+        say(e.what());
     } catch (const mini::FormError& e) {
         say(e.what());
     }

@@ -17,6 +17,12 @@ std::string error_description(int number) {
 RuntimeError::RuntimeError(int number)
     : number_(number), message_("run-time error " + std::to_string(number) + ": " + error_description(number)) {}
 
+void RuntimeError::set_source(std::string source) {
+    if (!source_.empty() || source.empty()) return;
+    source_ = std::move(source);
+    message_ = source_ + ": " + message_;
+}
+
 void raise_error(int number) { throw RuntimeError(number); }
 
 }  // namespace kel

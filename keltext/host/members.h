@@ -4,6 +4,7 @@
 // Each control class describes itself in one short table next to the class (see ClassBuilder).
 #include <cstdint>
 #include <functional>
+#include <initializer_list>
 #include <memory>
 #include <span>
 #include <string>
@@ -84,11 +85,17 @@ public:
     virtual Variant get(std::string_view name, const Variant* index = nullptr) = 0;
     virtual void set(std::string_view name, const Variant& value, const Variant* index = nullptr) = 0;
     virtual Variant call(std::string_view name, std::span<const Variant> args) = 0;
+    // The arguments written in place: box.call("AddItem", {"Cash"}).
+    Variant call(std::string_view name, std::initializer_list<Variant> args) {
+        return call(name, std::span<const Variant>(args.begin(), args.size()));
+    }
 };
 
-// A control together with its class table.
+// A control together with its class table. A run-time error that leaves a member names it
+// ("KelCombo.ListIndex: run-time error 381: ...").
 class BoundControl : public Dispatch {
 public:
+    using Dispatch::call;
     BoundControl(Control& control, const ClassInfo& info) : control_(control), info_(info) {}
     Variant get(std::string_view name, const Variant* index = nullptr) override;
     void set(std::string_view name, const Variant& value, const Variant* index = nullptr) override;

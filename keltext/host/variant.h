@@ -53,7 +53,8 @@ public:
     template <class T> bool holds() const { return std::holds_alternative<T>(v_); }
 
     // The value of a number, a boolean (-1 / 0), a date (its day count) or empty (0).
-    // Anything else gives 0; use the conversions for the host's checked rules.
+    // Anything else, a text included, gives 0: to read a value as a number the way the host
+    // does, with error 13 for a text that is no number, use to_double (host/conversions.h).
     double number() const;
     const std::string& str() const;  // the string, or an empty one for other kinds
     std::shared_ptr<Object> object() const;

@@ -324,6 +324,10 @@ void Form::keystroke(const Keystroke& k) {
     impl_->run_pending();
 }
 
+void Form::type(std::string_view text) {
+    for (char c : text) keystroke(keystroke_for_char(static_cast<uint8_t>(c)));
+}
+
 void Form::key_down(int16_t key_code, int16_t shift) {
     impl_->key_down(impl_->require_focus(), key_code, shift);
     impl_->run_pending();

@@ -115,6 +115,8 @@ public:
     // Input to the focused control's edit field (FormError when no control has focus).
     // Each call delivers the synthetic keystrokes queued meanwhile before it returns.
     void keystroke(const Keystroke& k);  // key down, key press where it makes a character, key up
+    // Types a text (Windows-1252) as a person would, one keystroke a character.
+    void type(std::string_view text);
     void key_down(int16_t key_code, int16_t shift);
     void key_up(int16_t key_code, int16_t shift);
     void key_press(int16_t char_code);
