@@ -143,7 +143,7 @@ int run_terminal(std::span<const std::string_view> args) {
             try {
                 load_record(form, read_limited(*options->record, *limit), *options->record);
             } catch (const TextFileError& e) {
-                std::cerr << "kelform: " << e.what() << '\n';
+                std::cerr << *options->record << ": " << e.what() << '\n';
                 return 2;
             } catch (const RecordError& e) {
                 std::cerr << e.what() << '\n';

@@ -235,6 +235,13 @@ status=$(wait_exit)
 cmp -s "$work/rec.json" "$work/before.json" || fail "Escape changed the record"
 cmp -s "$work/v.kform" "$work/pristine.kform" || fail "Escape changed the form file"
 
+# A record that cannot be saved where it is: said before anything is typed.
+start run v.kform --record nodir/rec.json
+wait_for "nodir/rec.json cannot be saved: No such file or directory"
+send C-q
+status=$(wait_exit)
+[ "$status" = 1 ] || fail "exit status $status after Ctrl+Q"
+
 # A record that names no control of the form: reported, the form not opened, the file kept.
 printf '{"Nobody": "x"}\n' > "$work/bad.json"
 start run v.kform --record bad.json
