@@ -137,7 +137,7 @@ void plain_decimal(FuzzedDataProvider& in) {
         s += c;
         nonzero = true;
     }
-    if (s.empty()) s = "0";
+    if (s.empty()) s.push_back('0');
     if (frac_digits > 0) {
         std::string frac;
         // After "0." leading zeros of the fraction are fine, its significant digits stay under 16.

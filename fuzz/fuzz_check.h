@@ -23,7 +23,6 @@ inline bool known_error(const RuntimeError& e) {
         case kInvalidPropertyValue:
         case kInvalidPropertyIndex:
         case kNoSuchMember:
-        case 28:   // events raised again and again from the form's own handlers
         case 383:  // a write to a member a widget only lets be read
             return true;
         default:

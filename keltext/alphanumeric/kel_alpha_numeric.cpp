@@ -19,36 +19,6 @@ constexpr int16_t kDefaultBorderStyle = KelANFixedSingle;
 constexpr float kControlHeight = 300;
 constexpr int16_t kVkInsert = 45;
 
-// ---- values read from a property store: a value that does not convert is skipped ----------
-
-std::optional<double> whole_number(const Variant& v) {
-    if (v.is_object() || !numeric_test(v)) return std::nullopt;
-    const double d = round_half_even(to_double(v));
-    if (!std::isfinite(d)) return std::nullopt;
-    return d;
-}
-
-std::optional<int32_t> stored_int32(const Variant& v) {
-    const auto d = whole_number(v);
-    if (!d || *d < std::numeric_limits<int32_t>::min() || *d > std::numeric_limits<int32_t>::max()) return std::nullopt;
-    return static_cast<int32_t>(*d);
-}
-
-std::optional<int16_t> stored_int16(const Variant& v) {
-    const auto d = whole_number(v);
-    if (!d || *d < std::numeric_limits<int16_t>::min() || *d > std::numeric_limits<int16_t>::max()) return std::nullopt;
-    return static_cast<int16_t>(*d);
-}
-
-std::optional<bool> stored_bool(const Variant& v) {
-    if (v.is_string()) {
-        if (same_name(v.str(), "True")) return true;
-        if (same_name(v.str(), "False")) return false;
-    }
-    if (v.is_object() || !numeric_test(v)) return std::nullopt;
-    return to_double(v) != 0;
-}
-
 // ---- event arguments come back with the kind the control gave them ------------------------
 
 int16_t returned_int16(const Variant& v, int16_t before) {

@@ -80,20 +80,26 @@ void KelCombo::InitProperties() {
 }
 
 void KelCombo::ReadProperties(PropertyBag& bag) {
-    m_FillList = text_of(bag.read("FillList", Variant("")));
-    cboCustom.ForeColor(to_int32(bag.read("Forecolor", Variant(kForeColor))));
-    cboCustom.BackColor(to_int32(bag.read("BackColor", Variant(kStoredBackColor))));
+    // A stored value that cannot be read skips its own step only: the list and the text must
+    // load whatever else the saved settings hold, or the next save writes the combo back empty.
+    if (const Variant v = bag.read("FillList", Variant("")); !v.is_object()) m_FillList = text_of(v);
+    if (const auto c = stored_int32(bag.read("Forecolor", Variant(kForeColor)))) cboCustom.ForeColor(*c);
+    if (const auto c = stored_int32(bag.read("BackColor", Variant(kStoredBackColor)))) cboCustom.BackColor(*c);
     Font(font_of(bag.read("Font", Variant(cboCustom.Font()))));
-    m_MaxLength = to_int16(bag.read("MaxLength", Variant(int16_t{0})));
-    m_AutoSearch = to_bool(bag.read("AutoSearch", Variant(false)));
-    Enabled(to_bool(bag.read("Enabled", Variant(true))));
-    Locked(to_bool(bag.read("Locked", Variant(false))));
-    m_TextType = to_int32(bag.read("TextType", Variant(int32_t{KelCboTitleCase})));
-    // The visible list is rebuilt from the saved list string, and only here.
+    if (const auto m = stored_int16(bag.read("MaxLength", Variant(int16_t{0})))) m_MaxLength = *m;
+    if (const auto b = stored_bool(bag.read("AutoSearch", Variant(false)))) m_AutoSearch = *b;
+    if (const auto b = stored_bool(bag.read("Enabled", Variant(true)))) Enabled(*b);
+    if (const auto b = stored_bool(bag.read("Locked", Variant(false)))) Locked(*b);
+    if (const auto t = stored_int32(bag.read("TextType", Variant(int32_t{KelCboTitleCase})))) m_TextType = *t;
+    // The visible list is rebuilt from the saved list string, and only here. A string of more
+    // entries than the list holds loads the first ones; m_FillList keeps it whole, so that an
+    // unedited combo saves all of it again.
     DecodeFillList(cboCustom, m_FillList);
-    const std::string text = text_of(bag.read("Text", Variant("")));
-    cboCustom.Text(text);
-    m_Text = text;
+    if (const Variant t = bag.read("Text", Variant("")); !t.is_object()) {
+        const std::string text = text_of(t);
+        cboCustom.Text(text);
+        m_Text = text;
+    }
 }
 
 void KelCombo::WriteProperties(PropertyBag& bag) {
@@ -217,7 +223,7 @@ void KelCombo::d_ComboSearch(int16_t& PKeyCode) {
 }
 
 void KelCombo::AddItem(const std::string& sItem, std::optional<int16_t> iIndex) {
-    if (m_MaxLength < 0) raise_error(kInvalidProcedureCall);
+    if (m_MaxLength < 0 || cboCustom.ListCount() >= kMaxListEntries) raise_error(kInvalidProcedureCall);
     const std::string item = m_MaxLength >= 1 ? sItem.substr(0, static_cast<std::size_t>(m_MaxLength)) : sItem;
     if (iIndex)
         cboCustom.AddItem(item, *iIndex);

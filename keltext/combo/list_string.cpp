@@ -95,14 +95,17 @@ void DecodeFillList(ListWidget& list, std::string_view list_string) {
             end = s.find(kEntrySeparator, end + 1);
             if (end == std::string_view::npos) end = s.size();
         }
-        if (end > i) AddFillEntry(list, s.substr(i, end - i));
+        if (end > i) {
+            if (list.ListCount() >= kMaxListEntries) break;
+            AddFillEntry(list, s.substr(i, end - i));
+        }
         i = end + 1;
     }
     if (list.ListCount() > 1) list.ListIndex(0);
 }
 
 void AddFillEntry(ListWidget& list, std::string_view entry) {
-    if (entry.empty()) return;
+    if (entry.empty() || list.ListCount() >= kMaxListEntries) return;
     const std::size_t q = text_part_end(entry, 0, false);
     if (q == entry.size()) return;
     const double value = leading_value(entry.substr(q + 1));

@@ -4,6 +4,7 @@
 
 #include "keltext/combo/list_string.h"
 #include "keltext/host/conversions.h"
+#include "keltext/host/errors.h"
 #include "keltext/host/members.h"
 
 namespace kel {
@@ -104,6 +105,7 @@ void pagCombo::ApplyChanges() {
 void pagCombo::cmdAdd_Click() {
     const std::string text = txtList.Text();
     if (text.empty()) return;
+    if (lstList.ListCount() >= kMaxListEntries) raise_error(kInvalidProcedureCall);
     lstList.AddItem(text);
     // Empty or non-numeric item data reads as 0.
     lstList.ItemData(lstList.NewIndex(), to_int32(leading_value(txtItemData.Text())));

@@ -3,6 +3,7 @@
 #include <cfloat>
 #include <charconv>
 #include <cmath>
+#include <limits>
 #include <optional>
 #include <system_error>
 
@@ -396,6 +397,38 @@ std::string name_key(std::string_view name) {
     for (char& c : key)
         if (c >= 'A' && c <= 'Z') c = static_cast<char>(c + 32);
     return key;
+}
+
+namespace {
+
+std::optional<double> stored_whole_number(const Variant& v) {
+    if (v.is_object() || !numeric_test(v)) return std::nullopt;
+    const double d = round_half_even(to_double(v));
+    if (!std::isfinite(d)) return std::nullopt;
+    return d;
+}
+
+}  // namespace
+
+std::optional<int32_t> stored_int32(const Variant& v) {
+    const auto d = stored_whole_number(v);
+    if (!d || *d < std::numeric_limits<int32_t>::min() || *d > std::numeric_limits<int32_t>::max()) return std::nullopt;
+    return static_cast<int32_t>(*d);
+}
+
+std::optional<int16_t> stored_int16(const Variant& v) {
+    const auto d = stored_whole_number(v);
+    if (!d || *d < std::numeric_limits<int16_t>::min() || *d > std::numeric_limits<int16_t>::max()) return std::nullopt;
+    return static_cast<int16_t>(*d);
+}
+
+std::optional<bool> stored_bool(const Variant& v) {
+    if (v.is_string()) {
+        if (same_name(v.str(), "True")) return true;
+        if (same_name(v.str(), "False")) return false;
+    }
+    if (v.is_object() || !numeric_test(v)) return std::nullopt;
+    return to_double(v) != 0;
 }
 
 }  // namespace kel

@@ -2,6 +2,7 @@
 // The host's value conversions. Every control reads and writes numbers through these,
 // and only through these, so that one rule holds everywhere.
 #include <cstdint>
+#include <optional>
 #include <string>
 #include <string_view>
 
@@ -56,6 +57,14 @@ int32_t to_int32(double value);
 
 // Numbers: non-zero is true; text "True"/"False" (any case) or numeric text; else error 13.
 bool to_bool(const Variant& v);
+
+// Values read from a property store, where a value that does not convert is skipped (the
+// control keeps what it has) instead of failing the whole load: a whole number (halves to
+// even) within the type's range, a boolean from a number or the text True/False (any case).
+// Nothing for objects, non-numeric text and anything out of range.
+std::optional<int16_t> stored_int16(const Variant& v);
+std::optional<int32_t> stored_int32(const Variant& v);
+std::optional<bool> stored_bool(const Variant& v);
 
 // Case-insensitive (ASCII) comparison of names: property keys, member names.
 bool same_name(std::string_view a, std::string_view b);

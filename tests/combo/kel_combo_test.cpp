@@ -4,7 +4,9 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <functional>
+#include <memory>
 #include <string>
 #include <vector>
 
@@ -83,6 +85,57 @@ TEST_F(ComboTest, SaveThenLoadGivesTheSameValues) {
         if (saved[i].first != "Font") {
             EXPECT_EQ(resaved[i], saved[i]) << saved[i].first;
         }
+}
+
+// A list string of `n` entries "E0", "E1", ... with their numbers as item data.
+std::string long_list(int n) {
+    std::string s;
+    for (int i = 0; i < n; ++i) s += "E" + std::to_string(i) + "\xC9" + std::to_string(i) + "\xC8";
+    return s;
+}
+
+// A stored value that cannot be read skips its own step: the rest loads, and what could not
+// be read keeps what the control had.
+TEST_F(ComboTest, UnreadableStoredValuesSkipOnlyTheirStep) {
+    int n = 0;
+    for (const char* key : {"MaxLength", "Forecolor", "BackColor", "AutoSearch", "Enabled", "Locked", "TextType"}) {
+        SCOPED_TRACE(key);
+        for (const Variant& bad : {Variant("abc"), Variant(1e300), Variant(std::make_shared<Font>("Arial", 9))}) {
+            HostedControl& c = form.load(cls, "c" + std::to_string(n++),
+                                         {{key, bad}, {"Text", Variant("kept")},
+                                          {"FillList", Variant(L("A[201]1[200]B[201]2[200]"))}});
+            EXPECT_EQ(get(c, "ListCount"), Variant(int16_t{2}));
+            EXPECT_EQ(get(c, "Text"), Variant("kept"));
+            const mini::StoredValues saved = form.save(c);
+            EXPECT_TRUE(std::any_of(saved.begin(), saved.end(), [](const auto& kv) { return kv.first == "FillList"; }));
+        }
+    }
+    // An item data beyond 32 bits reads as 0 and the rest of the list still loads.
+    HostedControl& d = form.load(cls, "d", {{"FillList", Variant(L("A[201]1[200]B[201]99999999999[200]C[201]3[200]"))}});
+    EXPECT_EQ(get(d, "ListCount"), Variant(int16_t{3}));
+    EXPECT_EQ(ctl(d).ItemData(Variant(int16_t{1})), Variant(0.0));
+    EXPECT_EQ(ctl(d).ItemData(Variant(int16_t{2})), Variant(3.0));
+}
+
+// A list holds 32,767 entries: a longer saved list loads that many and saves whole again, and
+// AddItem on a full list is refused.
+TEST_F(ComboTest, AFullListLoadsTheFirstEntriesAndSavesThemAll) {
+    const std::string whole = long_list(40000);
+    HostedControl& c = form.load(cls, "c", {{"FillList", Variant(whole)}});
+    EXPECT_EQ(get(c, "ListCount"), Variant(int16_t{32767}));
+    EXPECT_EQ(ctl(c).List(Variant(int16_t{32766})), Variant("E32766"));
+    const mini::StoredValues saved = form.save(c);
+    EXPECT_TRUE(std::find(saved.begin(), saved.end(), std::pair<std::string, Variant>{"FillList", Variant(whole)}) !=
+                saved.end());
+    const Variant item[] = {Variant("more")};
+    const Variant at_start[] = {Variant("more"), Variant(int16_t{0})};
+    EXPECT_EQ(error_of([&] { c.dispatch().call("AddItem", item); }), kInvalidProcedureCall);
+    EXPECT_EQ(error_of([&] { c.dispatch().call("AddItem", at_start); }), kInvalidProcedureCall);
+    EXPECT_EQ(get(c, "ListCount"), Variant(int16_t{32767}));
+    EXPECT_EQ(ctl(c).List(Variant(int16_t{0})), Variant("E0"));
+    c.dispatch().call("RemoveItem", std::vector<Variant>{Variant(int16_t{0})});
+    c.dispatch().call("AddItem", item);  // room again
+    EXPECT_EQ(ctl(c).List(Variant(int16_t{32766})), Variant("more"));
 }
 
 // ---- searching as the user types --------------------------------------------------------------

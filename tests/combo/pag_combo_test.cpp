@@ -84,6 +84,16 @@ TEST_F(PageTest, AddWithDataThatIsNoNumberStoresZero) {
     EXPECT_EQ(entries(pg), (Entries{{"A", 1}, {"D", 0}}));
 }
 
+TEST_F(PageTest, AddToAFullListIsRefused) {
+    std::string whole;
+    for (int i = 0; i < 32767; ++i) whole += "E[201]" + std::to_string(i) + "[200]";
+    HostedControl& pg = open({&combo("c", whole)});
+    type_into(pg, "txtList", "D");
+    click(pg, "cmdAdd");
+    EXPECT_EQ(errors.seen, (std::vector<std::string>{"pg0.cmdAdd.Click 5"}));
+    EXPECT_EQ(*peek(pg, "lstList", "ListCount").get_if<int32_t>(), 32767);
+}
+
 TEST_F(PageTest, ModifyWithNothingSelectedDoesNothing) {
     HostedControl& pg = open({&combo("c", "A[201]1[200]B[201]2[200]")});
     pg.part("lstList")->poke("ListIndex", Variant(int32_t{-1}));
