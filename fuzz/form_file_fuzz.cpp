@@ -21,20 +21,6 @@ using namespace kel::kelform;
 
 const std::string kFile = "fuzz.kform";
 
-// TODO: a numeric box stored with UpDownScroll true and a plain border reloads without the
-// flag, so its save drops the line; left out of the comparison until the numeric box keeps
-// the stored flag, so that the fuzzer goes on looking for anything else.
-SavedForm comparable(SavedForm form) {
-    for (SavedControl& c : form.controls) {
-        if (!kel::same_name(c.class_name, "KelNumeric")) continue;
-        const bool plain = std::any_of(c.stored.begin(), c.stored.end(), [](const auto& kv) {
-            return kel::same_name(kv.first, "BorderStyle") && kv.second.is_number() && kv.second.number() == 0;
-        });
-        if (plain) std::erase_if(c.stored, [](const auto& kv) { return kel::same_name(kv.first, "UpDownScroll"); });
-    }
-    return form;
-}
-
 }  // namespace
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
@@ -69,7 +55,7 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
         KEL_FUZZ_CHECK(e.file() == kFile);
         return 0;
     }
-    const std::string saved = write_form(comparable(capture_form(form, parsed)));
+    const std::string saved = write_form(capture_form(form, parsed));
     SavedForm reread;
     try {
         reread = parse_form(saved, kFile, classes);
@@ -88,7 +74,7 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
         std::fprintf(stderr, "saved form does not open: %s\n%s\n", e.what(), saved.c_str());
         KEL_FUZZ_CHECK(!"a saved form opens");
     }
-    const std::string saved_again = write_form(comparable(capture_form(second, reread)));
+    const std::string saved_again = write_form(capture_form(second, reread));
     if (saved_again != saved) std::fprintf(stderr, "first save:\n%s\nsecond save:\n%s\n", saved.c_str(), saved_again.c_str());
     KEL_FUZZ_CHECK(saved_again == saved);
     return 0;
