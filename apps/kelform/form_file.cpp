@@ -448,7 +448,8 @@ void check_stored(mini::HostedControl& hosted, const SavedControl& c, const std:
         return;  // nothing to compare with: the control is left as it loaded
     }
     for (std::size_t i = 0; i < c.stored.size(); ++i) {
-        const auto& [key, value] = c.stored[i];
+        const std::string& key = c.stored[i].first;
+        const Variant& value = c.stored[i].second;
         const int line = i < c.stored_lines.size() ? c.stored_lines[i] : c.line;
         const auto w = std::find_if(now.written.begin(), now.written.end(),
                                     [&](const WrittenValues::Written& x) { return same_name(x.key, key); });
