@@ -3,6 +3,7 @@
 // lets through, how it shapes their case, how overwrite mode is emulated, how the title-case
 // type rebuilds the text, and where the caret goes after a change. The control's handlers read
 // the edit box into these structs, call the rule and write the decision back.
+// Internal: installed only because kel_alpha_numeric.h includes it; embedders use the control, not these.
 #include <cstdint>
 #include <optional>
 #include <string>

@@ -2,6 +2,7 @@
 // The combo's keystroke rules as plain functions: the incremental search of the list and the
 // character filter of the edit field. The control reads its widget into these structs, calls
 // the rule and writes the decision back through the widget.
+// Internal: installed only because kel_combo.h includes it; embedders use the control, not these.
 #include <cstdint>
 #include <optional>
 #include <string>

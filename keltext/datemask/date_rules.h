@@ -4,6 +4,7 @@
 // day at 1-2, "/" at 3, the month at 4-5, "/" at 6 and the year at 7-10; the month-year text
 // of style mmyyA has the month at 1-2, "/" at 3, a two-digit year at 4-5 and a letter at 6.
 // None of them fails: a conversion that does not work leaves its target as it was.
+// Internal: installed only because kel_date_mask.h includes it; embedders use the control, not these.
 #include <cstdint>
 #include <string>
 #include <string_view>

@@ -4,6 +4,7 @@
 // returns what the control is to do; the control's handlers read the edit box into the state,
 // call the rule and apply the decision through the widget, so that every write raises the
 // widget's notifications in the order the rule made them.
+// Internal: installed only because kel_numeric.h includes it; embedders use the control, not these.
 #include <array>
 #include <cstddef>
 #include <cstdint>

@@ -11,6 +11,7 @@ namespace {
 // ---- character filter by type -------------------------------------------------------------
 
 struct FilterCase {
+    const char* name;
     int32_t type;
     int16_t key;
     int16_t expected;
@@ -31,19 +32,28 @@ constexpr int16_t ch(char c) { return static_cast<int16_t>(static_cast<unsigned 
 
 INSTANTIATE_TEST_SUITE_P(
     AllTypes, FilterByType,
-    ::testing::Values(FilterCase{KelANDigits, ch('5'), ch('5')}, FilterCase{KelANDigits, ch(' '), ch(' ')},
-                      FilterCase{KelANDigits, ch('.'), 0}, FilterCase{KelANDigits, ch('a'), 0},
-                      FilterCase{KelANDigits, 0xB2, 0} /* superscript two */, FilterCase{KelANDigits, 300, 0},
-                      FilterCase{KelANDigits, -49, 0}, FilterCase{KelANUAlphaNumeric, ch('z'), ch('Z')},
-                      FilterCase{KelANUAlphaNumeric, ch('_'), 0},
-                      FilterCase{KelANUAlphaNumeric, 0xE9, 0} /* e acute: not in the set */,
-                      FilterCase{KelANCommStyle, ch('}'), ch('}')}, FilterCase{KelANCommStyle, ch('_'), ch('_')},
-                      FilterCase{KelANCommStyle, ch('&'), 0}, FilterCase{KelANCommStyle, ch('\''), 0},
-                      FilterCase{KelANCommStyle, ch('<'), 0},
-                      FilterCase{KelANUpperCase, 0xE9, 0xC9} /* e acute to E acute */,
-                      FilterCase{KelANUpperCase, 0xFF, 0x9F} /* y diaeresis */,
-                      FilterCase{KelANUpperCase, 300, 300}, FilterCase{KelANUserKeys, 27, 27},
-                      FilterCase{-1, ch('x'), ch('x')}, FilterCase{1000000, ch('!'), ch('!')}));
+    ::testing::Values(FilterCase{"DigitsPassDigit", KelANDigits, ch('5'), ch('5')},
+                      FilterCase{"DigitsPassSpace", KelANDigits, ch(' '), ch(' ')},
+                      FilterCase{"DigitsDropFullStop", KelANDigits, ch('.'), 0},
+                      FilterCase{"DigitsDropLetter", KelANDigits, ch('a'), 0},
+                      FilterCase{"DigitsDropSuperscriptTwo", KelANDigits, 0xB2, 0},
+                      FilterCase{"DigitsDropCodeAbove255", KelANDigits, 300, 0},
+                      FilterCase{"DigitsDropNegativeCode", KelANDigits, -49, 0},
+                      FilterCase{"UAlphaNumericUpperCases", KelANUAlphaNumeric, ch('z'), ch('Z')},
+                      FilterCase{"UAlphaNumericDropUnderscore", KelANUAlphaNumeric, ch('_'), 0},
+                      FilterCase{"UAlphaNumericDropEAcute", KelANUAlphaNumeric, 0xE9, 0},
+                      FilterCase{"CommStylePassBrace", KelANCommStyle, ch('}'), ch('}')},
+                      FilterCase{"CommStylePassUnderscore", KelANCommStyle, ch('_'), ch('_')},
+                      FilterCase{"CommStyleDropAmpersand", KelANCommStyle, ch('&'), 0},
+                      FilterCase{"CommStyleDropApostrophe", KelANCommStyle, ch('\''), 0},
+                      FilterCase{"CommStyleDropLessThan", KelANCommStyle, ch('<'), 0},
+                      FilterCase{"UpperCaseEAcute", KelANUpperCase, 0xE9, 0xC9},
+                      FilterCase{"UpperCaseYDiaeresis", KelANUpperCase, 0xFF, 0x9F},
+                      FilterCase{"UpperCaseCodeAbove255Kept", KelANUpperCase, 300, 300},
+                      FilterCase{"UserKeysPassEscape", KelANUserKeys, 27, 27},
+                      FilterCase{"NegativeTypeActsAsUserKeys", -1, ch('x'), ch('x')},
+                      FilterCase{"LargeTypeActsAsUserKeys", 1000000, ch('!'), ch('!')}),
+    [](const auto& info) { return std::string(info.param.name); });
 
 // Sentence case capitalises only at the very start of the text.
 TEST(SentenceFilter, UpperCaseOnlyAtCaretZero) {

@@ -62,6 +62,7 @@ TEST_F(AlphaTest, HeightIsAlwaysThreeHundred) {
 // ---- typing ---------------------------------------------------------------------------------------
 
 struct TypingCase {
+    const char* name;
     int32_t type;
     const char* typed;
     const char* expected;
@@ -81,9 +82,12 @@ TEST_P(Typing, FiltersAndShapes) {
 
 INSTANTIATE_TEST_SUITE_P(
     AllTypes, Typing,
-    ::testing::Values(TypingCase{KelANDigits, "0509", "0509"}, TypingCase{99, "x.Y!", "x.Y!"},
-                      TypingCase{KelANTitleCase, "mary-ann o'neil", "Mary-ann O'neil"},
-                      TypingCase{KelANTitleCase, " x", " X"}, TypingCase{KelANTitleCase, "a  b", "A  B"}));
+    ::testing::Values(TypingCase{"DigitsKeepLeadingZero", KelANDigits, "0509", "0509"},
+                      TypingCase{"UnknownTypeTakesAnything", 99, "x.Y!", "x.Y!"},
+                      TypingCase{"TitleCaseOnlyAfterSpace", KelANTitleCase, "mary-ann o'neil", "Mary-ann O'neil"},
+                      TypingCase{"TitleCaseAfterLeadingSpace", KelANTitleCase, " x", " X"},
+                      TypingCase{"TitleCaseAfterTwoSpaces", KelANTitleCase, "a  b", "A  B"}),
+    [](const auto& info) { return std::string(info.param.name); });
 
 TEST_F(AlphaTest, OverwriteModeReplacesTheCharacterAfterTheCaret) {
     struct Case {
@@ -173,6 +177,7 @@ TEST_F(AlphaTest, EnterFocusSelectsTheText) {
 }
 
 struct ClampCase {
+    const char* name;
     int32_t type;
     Variant max, min;
     const char* text;
@@ -195,17 +200,19 @@ TEST_P(DigitsClamp, WhenFocusLeaves) {
 
 INSTANTIATE_TEST_SUITE_P(
     Cases, DigitsClamp,
-    ::testing::Values(ClampCase{KelANDigits, Variant(int16_t{0}), Variant(int16_t{0}), "750", "750"},
-                      ClampCase{KelANDigits, Variant(int16_t{500}), Variant(int16_t{10}), "250", "250"},
-                      ClampCase{KelANDigits, Variant(int16_t{2000}), Variant(int16_t{0}), "1 500", "1 500"},
-                      ClampCase{KelANDigits, Variant(int16_t{1000}), Variant(int16_t{0}), "1 500", "1000"},
-                      // Limits given as text are compared by value and written back as given.
-                      ClampCase{KelANDigits, Variant("1000"), Variant(int16_t{0}), "900", "900"},
-                      ClampCase{KelANDigits, Variant(2.5), Variant(int16_t{0}), "3", "2.5"},
-                      ClampCase{KelANDigits, Variant(int16_t{0}), Variant("50"), "9", "50"},
-                      ClampCase{KelANDigits, Variant("abc"), Variant(int16_t{0}), "900", "900"},
-                      ClampCase{KelANUpperCase, Variant(int16_t{5}), Variant(int16_t{0}), "99", "99"},
-                      ClampCase{KelANTitleCase, Variant(int16_t{5}), Variant(int16_t{50}), "9", "9"}));
+    ::testing::Values(
+        ClampCase{"NoLimits", KelANDigits, Variant(int16_t{0}), Variant(int16_t{0}), "750", "750"},
+        ClampCase{"InsideRange", KelANDigits, Variant(int16_t{500}), Variant(int16_t{10}), "250", "250"},
+        ClampCase{"BlankInsideUnderMax", KelANDigits, Variant(int16_t{2000}), Variant(int16_t{0}), "1 500", "1 500"},
+        ClampCase{"BlankInsideOverMax", KelANDigits, Variant(int16_t{1000}), Variant(int16_t{0}), "1 500", "1000"},
+        // Limits given as text are compared by value and written back as given.
+        ClampCase{"MaxAsText", KelANDigits, Variant("1000"), Variant(int16_t{0}), "900", "900"},
+        ClampCase{"MaxWithDecimals", KelANDigits, Variant(2.5), Variant(int16_t{0}), "3", "2.5"},
+        ClampCase{"MinAsText", KelANDigits, Variant(int16_t{0}), Variant("50"), "9", "50"},
+        ClampCase{"MaxNotANumber", KelANDigits, Variant("abc"), Variant(int16_t{0}), "900", "900"},
+        ClampCase{"UpperCaseNotClamped", KelANUpperCase, Variant(int16_t{5}), Variant(int16_t{0}), "99", "99"},
+        ClampCase{"TitleCaseNotClamped", KelANTitleCase, Variant(int16_t{5}), Variant(int16_t{50}), "9", "9"}),
+    [](const auto& info) { return std::string(info.param.name); });
 
 // ---- properties ----------------------------------------------------------------------------------------
 

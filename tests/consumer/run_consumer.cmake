@@ -1,20 +1,53 @@
-# Installs KelText into a scratch prefix, then configures, builds and runs a small application
-# that finds it with find_package(KelText).
-file(REMOVE_RECURSE ${WORK})
-set(build ${WORK}/keltext-build)
+# The installed-package tests, one STEP at a time:
+#   install       installs the libraries already built in BUILD into WORK/prefix
+#   find_package  configures, builds and runs the application in APP against that prefix
+#   pkg_config    builds the same application with the flags keltext.pc gives, and compiles a
+#                 file that includes every installed header (a public header that includes one
+#                 that is not installed fails here)
 set(prefix ${WORK}/prefix)
 function(run)
   execute_process(COMMAND ${ARGN} RESULT_VARIABLE rc OUTPUT_VARIABLE out ERROR_VARIABLE err)
   if(NOT rc EQUAL 0)
     message(FATAL_ERROR "failed: ${ARGN}\n${out}\n${err}")
   endif()
+  set(out "${out}" PARENT_SCOPE)
 endfunction()
-run(${CMAKE_COMMAND} -S ${SOURCE} -B ${build} -G ${GENERATOR} -DCMAKE_CXX_COMPILER=${CXX}
-    -DCMAKE_BUILD_TYPE=Release -DKELTEXT_BUILD_TESTS=OFF -DKELTEXT_BUILD_APPS=OFF -DKELTEXT_BUILD_BENCH=OFF
-    -DCMAKE_INSTALL_PREFIX=${prefix})
-run(${CMAKE_COMMAND} --build ${build} --parallel 2)
-run(${CMAKE_COMMAND} --install ${build})
-run(${CMAKE_COMMAND} -S ${SOURCE}/tests/consumer -B ${WORK}/app -G ${GENERATOR} -DCMAKE_CXX_COMPILER=${CXX}
-    -DCMAKE_PREFIX_PATH=${prefix})
-run(${CMAKE_COMMAND} --build ${WORK}/app)
-run(${WORK}/app/consumer)
+
+if(STEP STREQUAL "install")
+  file(REMOVE_RECURSE ${WORK})
+  run(${CMAKE_COMMAND} --install ${BUILD} --prefix ${prefix} --component development)
+elseif(STEP STREQUAL "find_package")
+  set(app ${WORK}/find_package)
+  file(REMOVE_RECURSE ${app})
+  run(${CMAKE_COMMAND} -S ${APP} -B ${app} -G ${GENERATOR} -DCMAKE_CXX_COMPILER=${CXX} -DCMAKE_PREFIX_PATH=${prefix})
+  run(${CMAKE_COMMAND} --build ${app})
+  run(${app}/consumer)
+elseif(STEP STREQUAL "pkg_config")
+  set(app ${WORK}/pkg_config)
+  file(REMOVE_RECURSE ${app})
+  file(MAKE_DIRECTORY ${app})
+  file(GLOB_RECURSE pc_files ${prefix}/keltext.pc)
+  list(LENGTH pc_files found)
+  if(NOT found EQUAL 1)
+    message(FATAL_ERROR "expected one keltext.pc under ${prefix}, found: ${pc_files}")
+  endif()
+  get_filename_component(pc_dir ${pc_files} DIRECTORY)
+  set(ENV{PKG_CONFIG_PATH} ${pc_dir})
+  run(${PKG_CONFIG} --cflags keltext)
+  separate_arguments(cflags UNIX_COMMAND "${out}")
+  run(${PKG_CONFIG} --libs keltext)
+  separate_arguments(libs UNIX_COMMAND "${out}")
+  # pkg-config cannot carry a language standard; an embedder's build names it.
+  run(${CXX} -std=c++20 ${cflags} ${APP}/main.cpp -o ${app}/consumer ${libs})
+  run(${app}/consumer)
+
+  file(GLOB_RECURSE headers RELATIVE ${prefix}/include ${prefix}/include/keltext/*.h)
+  set(all "")
+  foreach(h ${headers})
+    string(APPEND all "#include \"${h}\"\n")
+  endforeach()
+  file(WRITE ${app}/all_headers.cpp "${all}")
+  run(${CXX} -std=c++20 -fsyntax-only ${cflags} ${app}/all_headers.cpp)
+else()
+  message(FATAL_ERROR "unknown STEP '${STEP}'")
+endif()
