@@ -54,13 +54,6 @@ INSTANTIATE_TEST_SUITE_P(
                     SearchCase{"LongerThanEveryEntry", kFruit, false, "cherry pie", -1, 3}),
     [](const auto& info) { return std::string(info.param.name); });
 
-TEST(ComboSearch, IgnoredKeys) {
-    for (int k = 0; k <= 255; ++k) {
-        const bool ignored = (k >= 1 && k <= 31) || (k >= 33 && k <= 47) || k == 144;
-        EXPECT_EQ(search_ignores_key(static_cast<int16_t>(k)), ignored) << k;
-    }
-}
-
 // --- Filter --------------------------------------------------------------------------------
 
 struct FilterCase {
@@ -151,8 +144,8 @@ TEST(ComboFilter, CodeZeroIsLeftAlone) {
 }
 
 TEST(ComboFilter, StaleCaretStaysInsideTheText) {
-    EXPECT_EQ(title_case_edit("ab", 9, 4, false, 'x'), "Abx");
-    EXPECT_EQ(title_case_edit("ab", -3, 0, false, 'x'), "Xab");
+    EXPECT_EQ(title_case_typed("ab", 9, 4, false, 'x'), "Abx");
+    EXPECT_EQ(title_case_typed("ab", -3, 0, false, 'x'), "Xab");
 }
 
 }  // namespace
