@@ -127,6 +127,7 @@ const TitleCase kTitleCases[] = {
     {"UpperCaseInsideWordIsNotLowered", "Jo", 2, 0, 0, false, ch('H'), "JoH", std::nullopt},
     {"LetterAtStartOfText", "ohn", 0, 0, 0, false, ch('j'), "John", std::nullopt},
     {"TrailingSpacesCountForSpace", "Abc  ", 1, 0, 5, false, ch(' '), "Abc  ", std::nullopt},
+    {"SpaceBeforeSpaceStepsOverIt", "john smith", 4, 0, 0, false, ch(' '), "John  smith", 5},
     {"LimitAboveLengthTakesSpace", "Abcd", 1, 0, 5, false, ch(' '), "A Bcd", std::nullopt},
     {"FullBoxTypingFollowingCharacterStepsOver", "Abcde", 2, 0, 5, false, ch('c'), "Abcde", 3},
     {"OneBelowTheLimitTakesALetter", "Abcd", 4, 0, 5, false, ch('e'), "Abcde", std::nullopt},
