@@ -98,7 +98,7 @@ Keystroke keystroke_for_char(uint8_t c) {
         k.key_code = static_cast<int16_t>(c);
     } else if (c == ' ') {
         k.key_code = kVkSpace;
-    } else if (c == 8 || c == 13 || c == 27) {
+    } else if (c == kVkBackspace || c == kVkEnter || c == kVkEscape) {
         // The control codes that have keys of their own: Backspace, Enter, Escape.
         k.key_code = static_cast<int16_t>(c);
     } else {

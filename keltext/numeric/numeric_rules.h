@@ -55,8 +55,6 @@ public:
         steps_[count_++] = std::move(step);
     }
     std::span<const EditStep> view() const { return {steps_.data(), count_}; }
-    std::size_t size() const { return count_; }
-    const EditStep& operator[](std::size_t i) const { return steps_[i]; }
 
 private:
     std::array<EditStep, kCapacity> steps_{};
