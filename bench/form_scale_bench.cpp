@@ -73,7 +73,7 @@ void BM_TerminalKeystroke(benchmark::State& state) {
     session.render(canvas);
     bool type = true;
     for (auto _ : state) {
-        session.handle(type ? Input::char_of(U'k') : Input::key_of(mini::kVkBackspace));
+        session.handle(type ? Input::char_of(U'k') : Input::key_of(kVkBackspace));
         session.render(canvas);
         type = !type;
     }

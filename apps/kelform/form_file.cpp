@@ -452,7 +452,7 @@ void check_stored(mini::HostedControl& hosted, const SavedControl& c, const std:
         const Variant& value = c.stored[i].second;
         const int line = i < c.stored_lines.size() ? c.stored_lines[i] : c.line;
         const auto w = std::find_if(now.written.begin(), now.written.end(),
-                                    [&](const WrittenValues::Written& x) { return same_name(x.key, key); });
+                                    [&key = key](const WrittenValues::Written& x) { return same_name(x.key, key); });
         if (w == now.written.end())
             throw FormFileError(file, line, c.name + ": " + c.class_name + " stores no '" + key + "'");
         // Fonts are objects the store never calls equal: they compare as the file writes them.

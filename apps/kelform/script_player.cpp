@@ -11,13 +11,6 @@
 namespace kel::kelform {
 namespace {
 
-std::string lower_case_ascii(std::string_view s) {
-    std::string out(s);
-    for (char& c : out)
-        if (c >= 'A' && c <= 'Z') c = static_cast<char>(c - 'A' + 'a');
-    return out;
-}
-
 bool same_value(const Variant& a, const Variant& b) {
     if (a.is_object() && b.is_object()) {
         auto fa = font_of(a), fb = font_of(b);
@@ -136,7 +129,7 @@ Player::~Player() {
     form_.reset();
 }
 
-void Player::add_command(std::string name, CommandFn run) { commands_[lower_case_ascii(name)] = std::move(run); }
+void Player::add_command(std::string name, CommandFn run) { commands_[name_key(name)] = std::move(run); }
 
 void Player::add_builtin_commands() {
     // The whole command table: a command is its name and the member that runs it.
@@ -202,7 +195,7 @@ void Player::run_line(std::string_view line) {
 }
 
 void Player::run_command(std::string_view word, Args& args) {
-    auto it = commands_.find(lower_case_ascii(word));
+    auto it = commands_.find(name_key(word));
     if (it == commands_.end()) throw ScriptError("unknown command '" + shown(word) + "'");
     it->second(*this, args);
 }
@@ -236,7 +229,7 @@ Player::PartRef Player::resolve_part(std::string_view control_name, std::string_
     std::string spelled;
     for (const auto& [name, p] : c.parts())
         if (p == part) spelled = name;
-    if (spelled.empty()) spelled = lower_case_ascii(part_name);  // "surface", "page"
+    if (spelled.empty()) spelled = name_key(part_name);  // "surface", "page"
     return PartRef{&c, part, c.name() + "." + spelled};
 }
 
@@ -468,8 +461,8 @@ mini::HostedControl& Player::focused_for_input() {
 
 void Player::keystroke(const mini::Keystroke& k) {
     // Tab and Shift+Tab belong to the form: they move focus and reach no control.
-    if (k.key_code == mini::kVkTab && (k.shift & (mini::kCtrlMask | mini::kAltMask)) == 0) {
-        guarded("form", [&] { form_->tab((k.shift & mini::kShiftMask) == 0); });
+    if (k.key_code == kVkTab && (k.shift & (kCtrlMask | kAltMask)) == 0) {
+        guarded("form", [&] { form_->tab((k.shift & kShiftMask) == 0); });
         return;
     }
     mini::HostedControl& c = focused_for_input();

@@ -28,19 +28,6 @@ int hex_digit(char c) {
     return -1;
 }
 
-char lower(char c) { return (c >= 'A' && c <= 'Z') ? static_cast<char>(c - 'A' + 'a') : c; }
-
-bool same_word(std::string_view a, std::string_view b) {
-    if (a.size() != b.size()) return false;
-    for (std::size_t i = 0; i < a.size(); ++i)
-        if (lower(a[i]) != lower(b[i])) return false;
-    return true;
-}
-
-bool starts_with_word(std::string_view s, std::string_view prefix) {
-    return s.size() >= prefix.size() && same_word(s.substr(0, prefix.size()), prefix);
-}
-
 [[noreturn]] void malformed_value(std::string_view word) {
     throw ScriptError("malformed value '" + shown(word) + "'");
 }
@@ -233,9 +220,9 @@ Variant read_font(std::string_view word) {
         rest = rest.substr(colon + 1);
         colon = rest.find(':');
         std::string_view flag = rest.substr(0, colon);
-        if (same_word(flag, "bold") && !bold)
+        if (same_name(flag, "bold") && !bold)
             bold = true;
-        else if (same_word(flag, "italic") && !italic)
+        else if (same_name(flag, "italic") && !italic)
             italic = true;
         else
             malformed_value(word);
@@ -295,34 +282,34 @@ std::string decode_string(std::string_view word) {
 Variant parse_value(std::string_view word) {
     if (word.empty()) malformed_value(word);
     if (word[0] == '"') return Variant(decode_string(word));
-    if (same_word(word, "empty")) return Variant();
-    if (same_word(word, "true")) return Variant(true);
-    if (same_word(word, "false")) return Variant(false);
+    if (same_name(word, "empty")) return Variant();
+    if (same_name(word, "true")) return Variant(true);
+    if (same_name(word, "false")) return Variant(false);
     if (auto n = read_number(word)) return *n;
-    if (starts_with_word(word, "u8:")) {
+    if (starts_with_name(word, "u8:")) {
         if (auto v = read_typed_whole(word.substr(3), 0, 255, 2)) return Variant(static_cast<uint8_t>(*v));
-    } else if (starts_with_word(word, "i16:")) {
+    } else if (starts_with_name(word, "i16:")) {
         if (auto v = read_typed_whole(word.substr(4), std::numeric_limits<int16_t>::min(),
                                       std::numeric_limits<int16_t>::max(), 4))
             return Variant(static_cast<int16_t>(*v));
-    } else if (starts_with_word(word, "i32:")) {
+    } else if (starts_with_name(word, "i32:")) {
         if (auto v = read_typed_whole(word.substr(4), std::numeric_limits<int32_t>::min(),
                                       std::numeric_limits<int32_t>::max(), 8))
             return Variant(static_cast<int32_t>(*v));
-    } else if (starts_with_word(word, "f32:")) {
+    } else if (starts_with_name(word, "f32:")) {
         if (auto v = read_floating<float>(word.substr(4))) return Variant(*v);
-    } else if (starts_with_word(word, "f64:")) {
+    } else if (starts_with_name(word, "f64:")) {
         if (auto v = read_floating<double>(word.substr(4))) return Variant(*v);
-    } else if (starts_with_word(word, "date:")) {
+    } else if (starts_with_name(word, "date:")) {
         if (auto d = read_date(word.substr(5))) return Variant(*d);
-    } else if (starts_with_word(word, "font:")) {
+    } else if (starts_with_name(word, "font:")) {
         return read_font(word);
     }
     malformed_value(word);
 }
 
 Expected parse_expected(std::string_view word) {
-    if (starts_with_word(word, "error:")) {
+    if (starts_with_name(word, "error:")) {
         auto w = read_whole(word.substr(6), 0);
         if (!w || w->value < 0 || w->value > std::numeric_limits<int32_t>::max()) malformed_value(word);
         return Expected{Variant(), static_cast<int>(w->value)};

@@ -20,9 +20,9 @@ using mini::HostedControl;
 using mini::Keystroke;
 using mini::Part;
 
-constexpr int16_t kVkF2 = mini::kVkF1 + 1;
-constexpr int16_t kVkF4 = mini::kVkF1 + 3;
-constexpr int16_t kVkF10 = mini::kVkF1 + 9;
+constexpr int16_t kVkF2 = kVkF1 + 1;
+constexpr int16_t kVkF4 = kVkF1 + 3;
+constexpr int16_t kVkF10 = kVkF1 + 9;
 
 constexpr float kTwipsPerCell = 120;  // a Fixedsys character cell, as the controls size themselves
 constexpr std::size_t kMaxEvents = 500;
@@ -350,8 +350,8 @@ bool TerminalSession::finish_focus() {
 }
 
 TerminalSession::Outcome TerminalSession::handle_key(int16_t key, int16_t shift) {
-    const bool ctrl = (shift & mini::kCtrlMask) != 0;
-    const bool alt = (shift & mini::kAltMask) != 0;
+    const bool ctrl = (shift & kCtrlMask) != 0;
+    const bool alt = (shift & kAltMask) != 0;
     if (calendar_) {
         if (calendar_key(key, shift)) return Outcome::going_on;
         calendar_.reset();
@@ -375,7 +375,7 @@ TerminalSession::Outcome TerminalSession::handle_key(int16_t key, int16_t shift)
         if (complete_field(true, "not saved")) save_record();
         return Outcome::going_on;
     }
-    if ((key == mini::kVkEscape && shift == 0) || (ctrl && !alt && key == 'Q')) {
+    if ((key == kVkEscape && shift == 0) || (ctrl && !alt && key == 'Q')) {
         if (!changed()) return Outcome::quit;
         confirm_quit_ = true;
         say("Discard changes? y/n");
@@ -386,35 +386,35 @@ TerminalSession::Outcome TerminalSession::handle_key(int16_t key, int16_t shift)
         return Outcome::going_on;
     }
     HostedControl* focused = form_.focused();
-    if (key == mini::kVkTab && !ctrl && !alt) {
-        if (focused) form_.tab((shift & mini::kShiftMask) == 0);
+    if (key == kVkTab && !ctrl && !alt) {
+        if (focused) form_.tab((shift & kShiftMask) == 0);
         else form_.tab(true);
         return Outcome::going_on;
     }
     if (!focused) return Outcome::going_on;
     const bool f4 = key == kVkF4 && shift == 0;
-    if (f4 || (alt && (key == mini::kVkDown || key == mini::kVkUp))) {
-        if (is_class(*focused, "KelCombo") && (f4 || key == mini::kVkDown)) {
+    if (f4 || (alt && (key == kVkDown || key == kVkUp))) {
+        if (is_class(*focused, "KelCombo") && (f4 || key == kVkDown)) {
             open_list(*focused);
             return Outcome::going_on;
         }
-        if (is_class(*focused, "KelDateMask") && (f4 || key == mini::kVkDown)) {
+        if (is_class(*focused, "KelDateMask") && (f4 || key == kVkDown)) {
             press_calendar_button(*focused);
             return Outcome::going_on;
         }
         if (is_class(*focused, "KelNumeric") && alt) {
-            press_spin(*focused, key == mini::kVkUp);
+            press_spin(*focused, key == kVkUp);
             return Outcome::going_on;
         }
     }
     Keystroke k{key, shift, std::nullopt};
     // Keys that make a character: Backspace, Enter, Escape and Ctrl with a letter.
-    if (key == mini::kVkBackspace || key == mini::kVkEnter) k.char_code = key;
+    if (key == kVkBackspace || key == kVkEnter) k.char_code = key;
     else if (ctrl && !alt && key >= 'A' && key <= 'Z') k.char_code = static_cast<int16_t>(key - 64);
     deliver(k);
     // Enter moves on as Tab does, as clerks expect; the control (and the form's KeyPress)
     // has had it first.
-    if (key == mini::kVkEnter && shift == 0 && form_.focused() == focused) form_.tab(true);
+    if (key == kVkEnter && shift == 0 && form_.focused() == focused) form_.tab(true);
     return Outcome::going_on;
 }
 
@@ -484,27 +484,27 @@ bool TerminalSession::list_key(int16_t key, int16_t shift) {
     Part* combo = control ? part_of_type(*control, "ComboBox") : nullptr;
     const int32_t count = static_cast<int32_t>(peek_number(combo, "ListCount"));
     if (count <= 0) return false;
-    const bool alt = (shift & mini::kAltMask) != 0;
+    const bool alt = (shift & kAltMask) != 0;
     int32_t& h = list_->highlight;
     switch (key) {
-        case mini::kVkUp:
+        case kVkUp:
             if (alt) break;
             h = std::max(h - 1, 0);
             return true;
-        case mini::kVkDown:
+        case kVkDown:
             if (alt) break;
             h = std::min(h + 1, count - 1);
             return true;
-        case mini::kVkPageUp: h = std::max(h - kListRows, 0); return true;
-        case mini::kVkPageDown: h = std::min(h + kListRows, count - 1); return true;
-        case mini::kVkHome: h = 0; return true;
-        case mini::kVkEnd: h = count - 1; return true;
-        case mini::kVkEnter: pick_list_entry(h); return true;
-        case mini::kVkEscape: list_.reset(); return true;
-        case mini::kVkTab: pick_list_entry(h); return false;  // picks, then Tab moves on
+        case kVkPageUp: h = std::max(h - kListRows, 0); return true;
+        case kVkPageDown: h = std::min(h + kListRows, count - 1); return true;
+        case kVkHome: h = 0; return true;
+        case kVkEnd: h = count - 1; return true;
+        case kVkEnter: pick_list_entry(h); return true;
+        case kVkEscape: list_.reset(); return true;
+        case kVkTab: pick_list_entry(h); return false;  // picks, then Tab moves on
         default: break;
     }
-    if (key == kVkF4 || (alt && (key == mini::kVkUp || key == mini::kVkDown))) {
+    if (key == kVkF4 || (alt && (key == kVkUp || key == kVkDown))) {
         pick_list_entry(h);
         return true;
     }
@@ -558,24 +558,24 @@ bool TerminalSession::calendar_key(int16_t key, int16_t shift) {
     const auto move_to = [&](Date d) {
         if (const Ymd y = to_ymd(d); y.year >= 100 && y.year <= 9999) c.year = y.year, c.month = y.month, c.day = y.day;
     };
-    if (shift & (mini::kCtrlMask | mini::kAltMask)) {
-        if ((shift & mini::kAltMask) && key == mini::kVkUp) {
+    if (shift & (kCtrlMask | kAltMask)) {
+        if ((shift & kAltMask) && key == kVkUp) {
             calendar_.reset();
             return true;
         }
         return false;
     }
     switch (key) {
-        case mini::kVkLeft: move_to(Date{day.serial - 1}); return true;
-        case mini::kVkRight: move_to(Date{day.serial + 1}); return true;
-        case mini::kVkUp: move_to(Date{day.serial - 7}); return true;
-        case mini::kVkDown: move_to(Date{day.serial + 7}); return true;
-        case mini::kVkPageUp: move_to(add_months(c.year, c.month, c.day, -1)); return true;
-        case mini::kVkPageDown: move_to(add_months(c.year, c.month, c.day, 1)); return true;
-        case mini::kVkHome: c.day = 1; return true;
-        case mini::kVkEnd: c.day = days_in_month(c.year, c.month); return true;
-        case mini::kVkEnter: pick_calendar_day(); return true;
-        case mini::kVkEscape: calendar_.reset(); return true;
+        case kVkLeft: move_to(Date{day.serial - 1}); return true;
+        case kVkRight: move_to(Date{day.serial + 1}); return true;
+        case kVkUp: move_to(Date{day.serial - 7}); return true;
+        case kVkDown: move_to(Date{day.serial + 7}); return true;
+        case kVkPageUp: move_to(add_months(c.year, c.month, c.day, -1)); return true;
+        case kVkPageDown: move_to(add_months(c.year, c.month, c.day, 1)); return true;
+        case kVkHome: c.day = 1; return true;
+        case kVkEnd: c.day = days_in_month(c.year, c.month); return true;
+        case kVkEnter: pick_calendar_day(); return true;
+        case kVkEscape: calendar_.reset(); return true;
         default: return false;
     }
 }

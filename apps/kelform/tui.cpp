@@ -34,10 +34,6 @@ namespace {
 
 constexpr int kPollMs = 250;  // how long a read waits before the loop looks at signals
 
-using mini::kAltMask;
-using mini::kCtrlMask;
-using mini::kShiftMask;
-
 // Key codes of our own for the modifier sequences xterm-like terminals send and terminfo
 // often does not name (Alt+Down opens the combo's list).
 constexpr int kFirstCustomKey = KEY_MAX + 1;
@@ -47,16 +43,16 @@ struct ModifiedKey {
     int16_t shift;
 };
 constexpr ModifiedKey kModifiedKeys[] = {
-    {"\033[1;3A", mini::kVkUp, kAltMask},          {"\033[1;3B", mini::kVkDown, kAltMask},
-    {"\033[1;3C", mini::kVkRight, kAltMask},       {"\033[1;3D", mini::kVkLeft, kAltMask},
-    {"\033[1;5A", mini::kVkUp, kCtrlMask},         {"\033[1;5B", mini::kVkDown, kCtrlMask},
-    {"\033[1;5C", mini::kVkRight, kCtrlMask},      {"\033[1;5D", mini::kVkLeft, kCtrlMask},
-    {"\033[1;5H", mini::kVkHome, kCtrlMask},       {"\033[1;5F", mini::kVkEnd, kCtrlMask},
-    {"\033[1;2A", mini::kVkUp, kShiftMask},        {"\033[1;2B", mini::kVkDown, kShiftMask},
-    {"\033[1;2C", mini::kVkRight, kShiftMask},     {"\033[1;2D", mini::kVkLeft, kShiftMask},
-    {"\033[1;2H", mini::kVkHome, kShiftMask},      {"\033[1;2F", mini::kVkEnd, kShiftMask},
-    {"\033\033[A", mini::kVkUp, kAltMask},         {"\033\033[B", mini::kVkDown, kAltMask},
-    {"\033[1;3H", mini::kVkHome, kAltMask},        {"\033[1;3F", mini::kVkEnd, kAltMask},
+    {"\033[1;3A", kVkUp, kAltMask},          {"\033[1;3B", kVkDown, kAltMask},
+    {"\033[1;3C", kVkRight, kAltMask},       {"\033[1;3D", kVkLeft, kAltMask},
+    {"\033[1;5A", kVkUp, kCtrlMask},         {"\033[1;5B", kVkDown, kCtrlMask},
+    {"\033[1;5C", kVkRight, kCtrlMask},      {"\033[1;5D", kVkLeft, kCtrlMask},
+    {"\033[1;5H", kVkHome, kCtrlMask},       {"\033[1;5F", kVkEnd, kCtrlMask},
+    {"\033[1;2A", kVkUp, kShiftMask},        {"\033[1;2B", kVkDown, kShiftMask},
+    {"\033[1;2C", kVkRight, kShiftMask},     {"\033[1;2D", kVkLeft, kShiftMask},
+    {"\033[1;2H", kVkHome, kShiftMask},      {"\033[1;2F", kVkEnd, kShiftMask},
+    {"\033\033[A", kVkUp, kAltMask},         {"\033\033[B", kVkDown, kAltMask},
+    {"\033[1;3H", kVkHome, kAltMask},        {"\033[1;3F", kVkEnd, kAltMask},
 };
 
 std::optional<Input> named_key(int code) {
@@ -65,37 +61,37 @@ std::optional<Input> named_key(int code) {
         return Input::key_of(m.key, m.shift);
     }
     if (code >= KEY_F(1) && code <= KEY_F(12))
-        return Input::key_of(static_cast<int16_t>(mini::kVkF1 + (code - KEY_F(1))));
+        return Input::key_of(static_cast<int16_t>(kVkF1 + (code - KEY_F(1))));
     switch (code) {
-        case KEY_UP: return Input::key_of(mini::kVkUp);
-        case KEY_DOWN: return Input::key_of(mini::kVkDown);
-        case KEY_LEFT: return Input::key_of(mini::kVkLeft);
-        case KEY_RIGHT: return Input::key_of(mini::kVkRight);
-        case KEY_HOME: return Input::key_of(mini::kVkHome);
-        case KEY_END: return Input::key_of(mini::kVkEnd);
-        case KEY_SLEFT: return Input::key_of(mini::kVkLeft, kShiftMask);
-        case KEY_SRIGHT: return Input::key_of(mini::kVkRight, kShiftMask);
-        case KEY_SHOME: return Input::key_of(mini::kVkHome, kShiftMask);
-        case KEY_SEND: return Input::key_of(mini::kVkEnd, kShiftMask);
-        case KEY_IC: return Input::key_of(mini::kVkInsert);
-        case KEY_DC: return Input::key_of(mini::kVkDelete);
-        case KEY_PPAGE: return Input::key_of(mini::kVkPageUp);
-        case KEY_NPAGE: return Input::key_of(mini::kVkPageDown);
-        case KEY_BACKSPACE: return Input::key_of(mini::kVkBackspace);
-        case KEY_ENTER: return Input::key_of(mini::kVkEnter);
-        case KEY_BTAB: return Input::key_of(mini::kVkTab, kShiftMask);
+        case KEY_UP: return Input::key_of(kVkUp);
+        case KEY_DOWN: return Input::key_of(kVkDown);
+        case KEY_LEFT: return Input::key_of(kVkLeft);
+        case KEY_RIGHT: return Input::key_of(kVkRight);
+        case KEY_HOME: return Input::key_of(kVkHome);
+        case KEY_END: return Input::key_of(kVkEnd);
+        case KEY_SLEFT: return Input::key_of(kVkLeft, kShiftMask);
+        case KEY_SRIGHT: return Input::key_of(kVkRight, kShiftMask);
+        case KEY_SHOME: return Input::key_of(kVkHome, kShiftMask);
+        case KEY_SEND: return Input::key_of(kVkEnd, kShiftMask);
+        case KEY_IC: return Input::key_of(kVkInsert);
+        case KEY_DC: return Input::key_of(kVkDelete);
+        case KEY_PPAGE: return Input::key_of(kVkPageUp);
+        case KEY_NPAGE: return Input::key_of(kVkPageDown);
+        case KEY_BACKSPACE: return Input::key_of(kVkBackspace);
+        case KEY_ENTER: return Input::key_of(kVkEnter);
+        case KEY_BTAB: return Input::key_of(kVkTab, kShiftMask);
         default: return std::nullopt;
     }
 }
 
 std::optional<Input> character_key(wint_t ch) {
     switch (ch) {
-        case 9: return Input::key_of(mini::kVkTab);
+        case 9: return Input::key_of(kVkTab);
         case 10:
-        case 13: return Input::key_of(mini::kVkEnter);
+        case 13: return Input::key_of(kVkEnter);
         case 8:
-        case 127: return Input::key_of(mini::kVkBackspace);
-        case 27: return Input::key_of(mini::kVkEscape);
+        case 127: return Input::key_of(kVkBackspace);
+        case 27: return Input::key_of(kVkEscape);
         default: break;
     }
     if (ch >= 1 && ch <= 26) return Input::key_of(static_cast<int16_t>('A' + ch - 1), kCtrlMask);
@@ -232,7 +228,7 @@ public:
             wint_t next = 0;
             const int r2 = get_wch(&next);
             timeout(kPollMs);
-            if (r2 == ERR) return Input::key_of(mini::kVkEscape);
+            if (r2 == ERR) return Input::key_of(kVkEscape);
             if (r2 == OK && (next == '[' || next == 'O')) {
                 // An escape sequence curses does not know (a key with modifiers it has no name
                 // for, a mouse report in SGR form): read it whole so that none of it is typed.

@@ -9,6 +9,8 @@
 #include <string>
 #include <string_view>
 
+#include "keltext/host/typing.h"
+
 namespace kel {
 
 // The character class of the box. The property keeps any 32-bit value; values outside the
@@ -29,18 +31,11 @@ enum KelANBorderStyle : int32_t {
     KelANFixedSingle = 1,
 };
 
-// The character sets, exactly as the box matches them (by code, no case folding).
-inline constexpr std::string_view kAlphaNumericSet =
-    "ABCDEFGHIJKLMNOPQRSTUVWXYZ  abcdefghijklmnopqrstuvwxyz1234567890";
+// The box's own character sets, matched by code with no case folding (the upper-case
+// alphanumeric set is the host's kAlphaNumericSet, shared with the combo).
 inline constexpr std::string_view kCommStyleSet =
     "() 1234567890@#*{}[]-_ABCDEFGHIJKLMNOPQRSTUVWXYZabcdefghijklmnopqrstuvwxyz";
 inline constexpr std::string_view kDigitSet = "123456789 0";
-
-// True when the key-press code is a character of the set (codes outside 1..255 never are).
-bool in_char_set(std::string_view set, int16_t code);
-
-// The upper-case form of a key-press code; codes outside 0..255 come back unchanged.
-int16_t upper_code(int16_t code);
 
 // What the key-press handler reads from the edit box before filtering.
 struct AlphaEdit {

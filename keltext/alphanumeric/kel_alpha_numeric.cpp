@@ -9,6 +9,7 @@
 
 #include "keltext/host/conversions.h"
 #include "keltext/host/errors.h"
+#include "keltext/host/keys.h"
 
 namespace kel {
 namespace {
@@ -17,20 +18,6 @@ constexpr Colour kDefaultForeColor = 0xC00000;  // dark blue
 constexpr Colour kDefaultBackColor = 0xFFEFD0;  // pale blue
 constexpr int16_t kDefaultBorderStyle = KelANFixedSingle;
 constexpr float kControlHeight = 300;
-constexpr int16_t kVkInsert = 45;
-
-// ---- event arguments come back with the kind the control gave them ------------------------
-
-int16_t returned_int16(const Variant& v, int16_t before) {
-    if (const auto* p = v.get_if<int16_t>()) return *p;
-    return stored_int16(v).value_or(before);
-}
-
-float returned_single(const Variant& v, float before) {
-    if (const auto* p = v.get_if<float>()) return *p;
-    if (v.is_number()) return static_cast<float>(v.number());
-    return before;
-}
 
 // A limit as a number: MaxValue and MinValue hold numbers or numeric text, compared by value.
 double limit_value(const Variant& v) {
@@ -271,7 +258,7 @@ void KelAlphaNumeric::ExitFocus() {
 // ---- keystroke path ------------------------------------------------------------------------------
 
 void KelAlphaNumeric::TxtCustom_KeyDown(int16_t& key_code, int16_t& shift) {
-    raise_key_event(kKeyDown, "KeyDown", key_code, shift);
+    raise_key_event(site_, kKeyDown, "KeyDown", key_code, shift);
     const KeyDownDecision d = key_down_decision(key_code, shift);
     CtrlDown = d.ctrl_down;
     // Up and Down move to the previous and next control; the key itself is left alone.
@@ -285,9 +272,7 @@ void KelAlphaNumeric::TxtCustom_KeyDown(int16_t& key_code, int16_t& shift) {
 void KelAlphaNumeric::TxtCustom_KeyPress(int16_t& key_ascii) {
     // With Ctrl held the character goes to the edit box as it is, unseen by the form.
     if (CtrlDown) return;
-    std::array<EventArg, 1> args{{{"KeyAscii", Variant(key_ascii)}}};
-    site_.raise_event(kKeyPress, "KeyPress", args);
-    key_ascii = returned_int16(args[0].value, key_ascii);
+    raise_key_press(site_, kKeyPress, key_ascii);
     switch (key_press_action(key_ascii)) {
         case KeyPressAction::pass:
             break;
@@ -322,7 +307,7 @@ void KelAlphaNumeric::TxtCustom_Change() {
 }
 
 void KelAlphaNumeric::TxtCustom_KeyUp(int16_t& key_code, int16_t& shift) {
-    raise_key_event(kKeyUp, "KeyUp", key_code, shift);
+    raise_key_event(site_, kKeyUp, "KeyUp", key_code, shift);
 }
 
 void KelAlphaNumeric::TxtCustom_Click() {
@@ -339,13 +324,6 @@ void KelAlphaNumeric::TxtCustom_MouseDown(int16_t& button, int16_t& shift, float
 
 void KelAlphaNumeric::TxtCustom_MouseUp(int16_t& button, int16_t& shift, float& x, float& y) {
     raise_mouse_event(kMouseUp, "MouseUp", button, shift, x, y);
-}
-
-void KelAlphaNumeric::raise_key_event(Event number, std::string_view name, int16_t& key_code, int16_t& shift) {
-    std::array<EventArg, 2> args{{{"KeyCode", Variant(key_code)}, {"Shift", Variant(shift)}}};
-    site_.raise_event(number, name, args);
-    key_code = returned_int16(args[0].value, key_code);
-    shift = returned_int16(args[1].value, shift);
 }
 
 void KelAlphaNumeric::raise_mouse_event(Event number, std::string_view name, int16_t& button, int16_t& shift, float& x,

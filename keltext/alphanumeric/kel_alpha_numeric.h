@@ -86,7 +86,6 @@ private:
     // Filters one typed character and returns the code the edit box is to insert.
     int16_t FilterKey(int16_t& key_ascii);
 
-    void raise_key_event(Event number, std::string_view name, int16_t& key_code, int16_t& shift);
     void raise_mouse_event(Event number, std::string_view name, int16_t& button, int16_t& shift, float& x, float& y);
 
     Site& site_;

@@ -104,14 +104,14 @@ ClassInfo kel_combo_class() {
                     return Variant();
                 },
                 "Completes the text from the first list entry that begins with it.")
-        .event(1, "Click")
-        .event(2, "DblClick")
-        .event(3, "DropDown")
-        .event(4, "Change")
-        .event(5, "KeyDown", key_event_args())
-        .event(6, "KeyPress", {{"KeyAscii", "Integer"}})
-        .event(7, "KeyUp", key_event_args())
-        .event(8, "Scroll")
+        .event(KelCombo::kClick, "Click")
+        .event(KelCombo::kDblClick, "DblClick")
+        .event(KelCombo::kDropDown, "DropDown")
+        .event(KelCombo::kChange, "Change")
+        .event(KelCombo::kKeyDown, "KeyDown", key_event_args())
+        .event(KelCombo::kKeyPress, "KeyPress", {{"KeyAscii", "Integer"}})
+        .event(KelCombo::kKeyUp, "KeyUp", key_event_args())
+        .event(KelCombo::kScroll, "Scroll")
         .enumeration("KelCboType", {{"KelCboTitleCase", KelCboTitleCase},
                                     {"KelCboUserKeys", KelCboUserKeys},
                                     {"KelCboUpperCase", KelCboUpperCase},

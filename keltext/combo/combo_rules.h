@@ -8,6 +8,8 @@
 #include <string>
 #include <string_view>
 
+#include "keltext/host/typing.h"
+
 namespace kel {
 
 // The character class of a combo's edit field (its TextType).
@@ -20,9 +22,8 @@ enum KelCboType : int32_t {
     KelCboDigits = 5,
 };
 
-// The characters that KelCboUAlphaNumeric and KelCboDigits let through.
-inline constexpr std::string_view kComboAlphaNumericSet =
-    "ABCDEFGHIJKLMNOPQRSTUVWXYZ  abcdefghijklmnopqrstuvwxyz1234567890";
+// The characters that KelCboDigits lets through (KelCboUAlphaNumeric takes the host's
+// kAlphaNumericSet).
 inline constexpr std::string_view kComboDigitSet = "123456789 0.";
 
 // --- Incremental search ------------------------------------------------------------------
@@ -75,10 +76,6 @@ struct ComboDecision {
 };
 
 ComboDecision filter_combo_key(int32_t text_type, const ComboEdit& edit, int16_t key);
-
-// The title-case edit on its own: the new text (first character upper-cased) for typing `c`
-// at caret `p` over `sel_length` characters. The caret goes to p + 1.
-std::string title_case_edit(std::string_view text, int32_t p, int32_t sel_length, bool overwrite, char c);
 
 // Focus selection: the length of the text without its trailing spaces.
 int32_t length_without_trailing_spaces(std::string_view text);

@@ -6,6 +6,7 @@
 #include "keltext/combo/list_string.h"
 #include "keltext/host/conversions.h"
 #include "keltext/host/errors.h"
+#include "keltext/host/keys.h"
 
 namespace kel {
 namespace {
@@ -15,20 +16,6 @@ constexpr Colour kStoredBackColor = 0xFFEFD0;  // the default the saved settings
 constexpr Colour kForeColor = 0xC00000;
 constexpr float kMinWidth = 540;
 constexpr float kHeight = 353;
-constexpr int16_t kVkUp = 38;
-constexpr int16_t kVkDown = 40;
-constexpr int16_t kVkInsert = 45;
-constexpr int16_t kCtrlMask = 2;
-
-// A widget call whose failure the handler skips (an index out of range in an empty list).
-template <class F>
-void ignoring_errors(F&& f) {
-    try {
-        f();
-    } catch (const RuntimeError&) {
-        // The step is skipped; the handler goes on.
-    }
-}
 
 bool holds_int16(const Variant& v) { return v.kind() == VarKind::Int16; }
 
@@ -45,28 +32,21 @@ KelCombo::KelCombo(Site& site) : site_(site), cboCustom(site.create_combo_box("c
     cboCustom.Top(0);
 
     WidgetEvents events;
-    events.click = [this] { raise(1, "Click"); };
-    events.dbl_click = [this] { raise(2, "DblClick"); };
-    events.drop_down = [this] { raise(3, "DropDown"); };
+    events.click = [this] { raise(kClick, "Click"); };
+    events.dbl_click = [this] { raise(kDblClick, "DblClick"); };
+    events.drop_down = [this] { raise(kDropDown, "DropDown"); };
     events.change = [this] { on_change(); };
     events.key_down = [this](int16_t& k, int16_t& s) { on_key_down(k, s); };
     events.key_press = [this](int16_t& k) { on_key_press(k); };
     events.key_up = [this](int16_t& k, int16_t& s) { on_key_up(k, s); };
-    events.scroll = [this] { raise(8, "Scroll"); };
+    events.scroll = [this] { raise(kScroll, "Scroll"); };
     events.got_focus = [this] { on_got_focus(); };
     cboCustom.set_events(std::move(events));
 }
 
 // --- Events to the form ----------------------------------------------------------------------
 
-void KelCombo::raise(int number, std::string_view name) { site_.raise_event(number, name, {}); }
-
-void KelCombo::raise_key(int number, std::string_view name, int16_t& key_code, int16_t& shift) {
-    std::array<EventArg, 2> args{EventArg{"KeyCode", Variant(key_code)}, EventArg{"Shift", Variant(shift)}};
-    site_.raise_event(number, name, args);
-    key_code = to_int16(args[0].value);
-    shift = to_int16(args[1].value);
-}
+void KelCombo::raise(Event number, std::string_view name) { site_.raise_event(number, name, {}); }
 
 // --- Container events --------------------------------------------------------------------------
 
@@ -126,26 +106,28 @@ void KelCombo::Resize() {
 // --- Handlers of cboCustom ---------------------------------------------------------------------
 
 void KelCombo::on_key_down(int16_t& key_code, int16_t& shift) {
-    raise_key(5, "KeyDown", key_code, shift);
+    raise_key_event(site_, kKeyDown, "KeyDown", key_code, shift);
     CtrlDown = (shift & kCtrlMask) != 0;
     if (CtrlDown) return;
     // Up on the first entry and Down on the last wrap around the list; the key is consumed
-    // even when the wrap fails (Down in an empty list).
+    // even where there is nothing to wrap to (Down in an empty list).
+    const int32_t count = cboCustom.ListCount();
     if (key_code == kVkUp) {
         if (cboCustom.ListIndex() == 0) {
-            ignoring_errors([&] { cboCustom.ListIndex(cboCustom.ListCount() - 1); });
+            if (count > 0) cboCustom.ListIndex(count - 1);
             key_code = 0;
         }
     } else if (key_code == kVkDown) {
-        if (cboCustom.ListIndex() == cboCustom.ListCount() - 1) {
-            ignoring_errors([&] { cboCustom.ListIndex(0); });
+        if (cboCustom.ListIndex() == count - 1) {
+            if (count > 0) cboCustom.ListIndex(0);
             key_code = 0;
         }
     }
 }
 
 void KelCombo::on_key_press(int16_t& key_ascii) {
-    const bool edit_key = key_ascii == 8 || key_ascii == 9 || key_ascii == 10 || key_ascii == 13;
+    const bool edit_key = key_ascii == kCharBackspace || key_ascii == kCharTab || key_ascii == kCharLineFeed ||
+                          key_ascii == kCharEnter;
     if (m_MaxLength > 0 && !edit_key && cboCustom.SelLength() == 0 &&
         cboCustom.Text().size() == static_cast<std::size_t>(m_MaxLength)) {
         key_ascii = 0;
@@ -153,14 +135,12 @@ void KelCombo::on_key_press(int16_t& key_ascii) {
     }
     if (CtrlDown) return;
 
-    std::array<EventArg, 1> args{EventArg{"KeyAscii", Variant(key_ascii)}};
-    site_.raise_event(6, "KeyPress", args);
-    key_ascii = to_int16(args[0].value);
+    raise_key_press(site_, kKeyPress, key_ascii);
 
     // A key the form dropped stays dropped: the filter must not make a character of code 0.
     if (key_ascii == 0) return;
-    if (key_ascii == 8 || key_ascii == 9 || key_ascii == 10) return;
-    if (key_ascii == 13) {
+    if (key_ascii == kCharBackspace || key_ascii == kCharTab || key_ascii == kCharLineFeed) return;
+    if (key_ascii == kCharEnter) {
         key_ascii = 0;
         return;
     }
@@ -178,19 +158,20 @@ int16_t KelCombo::FilterKey(int16_t code) {
     edit.saved_sel_start = SavedSelStart;
     edit.overwrite = OverwriteMode;
     const ComboDecision d = filter_combo_key(m_TextType, edit, code);
-    if (d.select_one) ignoring_errors([&] { cboCustom.SelLength(1); });
-    if (d.text) ignoring_errors([&] { cboCustom.Text(*d.text); });
-    if (d.sel_start) ignoring_errors([&] { cboCustom.SelStart(*d.sel_start); });
+    if (d.select_one) cboCustom.SelLength(1);
+    if (d.text) cboCustom.Text(*d.text);
+    // The field refuses a caret before the start; the rule never asks for one.
+    if (d.sel_start && *d.sel_start >= 0) cboCustom.SelStart(*d.sel_start);
     return d.key;
 }
 
 void KelCombo::on_key_up(int16_t& key_code, int16_t& shift) {
-    raise_key(7, "KeyUp", key_code, shift);
+    raise_key_event(site_, kKeyUp, "KeyUp", key_code, shift);
     if (m_AutoSearch) d_ComboSearch(key_code);
 }
 
 void KelCombo::on_change() {
-    raise(4, "Change");
+    raise(kChange, "Change");
     if (m_MaxLength > 0) {
         const std::string text = cboCustom.Text();
         if (text.size() > static_cast<std::size_t>(m_MaxLength)) cboCustom.Text(text.substr(0, m_MaxLength));
@@ -297,10 +278,9 @@ void KelCombo::MaxLength(const Variant& v) {
         site_.property_changed("MaxLength");
         return;
     }
-    ignoring_errors([&] {
-        const double r = round_half_even(leading_value(text_of(v)));
-        if (r >= INT16_MIN && r <= INT16_MAX) m_MaxLength = static_cast<int16_t>(r);
-    });
+    // A value beyond 16 bits leaves the limit as it was.
+    const double r = round_half_even(leading_value(text_of(v)));
+    if (r >= INT16_MIN && r <= INT16_MAX) m_MaxLength = static_cast<int16_t>(r);
     // At design time a small font sizes the control to the text it can hold: 120 a character
     // plus the box's border and its button. A width below 0 is one the surface would refuse.
     if (!site_.user_mode() && cboCustom.FontSize() < 10 && m_MaxLength < 61) {

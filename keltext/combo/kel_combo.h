@@ -18,6 +18,18 @@ class KelCombo : public Control {
 public:
     explicit KelCombo(Site& site);
 
+    // Event numbers of the control's event interface.
+    enum Event : int {
+        kClick = 1,
+        kDblClick = 2,
+        kDropDown = 3,
+        kChange = 4,
+        kKeyDown = 5,
+        kKeyPress = 6,
+        kKeyUp = 7,
+        kScroll = 8,
+    };
+
     // Container events.
     void InitProperties() override;
     void ReadProperties(PropertyBag& bag) override;
@@ -76,8 +88,7 @@ private:
     void on_got_focus();
     int16_t FilterKey(int16_t code);
 
-    void raise(int number, std::string_view name);
-    void raise_key(int number, std::string_view name, int16_t& key_code, int16_t& shift);
+    void raise(Event number, std::string_view name);
 
     Site& site_;
     ComboBox& cboCustom;

@@ -9,6 +9,7 @@
 #include "keltext/host/date.h"
 #include "keltext/host/date_recognizer.h"
 #include "keltext/host/errors.h"
+#include "keltext/host/keys.h"
 #include "keltext/host/mask.h"
 
 namespace kel {
@@ -23,11 +24,6 @@ constexpr Colour kDefaultForeColor = 0xC00000;
 constexpr Colour kDefaultBackColor = 0xFFEFD0;
 constexpr float kDefaultWidth = 1695;
 
-constexpr int16_t kVkUpArrow = 38;
-constexpr int16_t kVkDownArrow = 40;
-constexpr int16_t kAsciiBackspace = 8;
-constexpr int16_t kAsciiEnter = 13;
-constexpr int16_t kAsciiSlash = 47;
 
 // Values read from a property store or given to the selection setters are used only when the
 // host's conversions would take them; anything else skips the step.
@@ -405,39 +401,30 @@ void KelDateMask::write_unmasked(const std::string& text, const std::string& mas
 
 // ---- Keystrokes -----------------------------------------------------------------------------
 
-void KelDateMask::raise_key_event(Event number, std::string_view name, int16_t& key_code, int16_t& shift) {
-    std::array<EventArg, 2> args{EventArg{"KeyCode", Variant(key_code)}, EventArg{"Shift", Variant(shift)}};
-    site_.raise_event(number, name, args);
-    if (const auto* k = args[0].value.get_if<int16_t>()) key_code = *k;
-    if (const auto* s = args[1].value.get_if<int16_t>()) shift = *s;
-}
-
 void KelDateMask::MskDate_KeyDown(int16_t& key_code, int16_t& shift) {
     validated_ = false;
     typed_at_ = -1;
-    raise_key_event(kKeyDown, "KeyDown", key_code, shift);
-    ctrl_down_ = (shift & 2) != 0;
+    raise_key_event(site_, kKeyDown, "KeyDown", key_code, shift);
+    ctrl_down_ = (shift & kCtrlMask) != 0;
     if (ctrl_down_) return;
-    if (key_code == kVkUpArrow) site_.keyboard().send_keys("+{TAB}");
-    if (key_code == kVkDownArrow) site_.keyboard().send_keys("{TAB}");
+    if (key_code == kVkUp) site_.keyboard().send_keys(kKeysBackTab);
+    if (key_code == kVkDown) site_.keyboard().send_keys(kKeysTab);
 }
 
 void KelDateMask::MskDate_KeyPress(int16_t& key_ascii) {
     validated_ = false;
-    std::array<EventArg, 1> args{EventArg{"KeyAscii", Variant(key_ascii)}};
-    site_.raise_event(kKeyPress, "KeyPress", args);
-    if (const auto* k = args[0].value.get_if<int16_t>()) key_ascii = *k;
+    raise_key_press(site_, kKeyPress, key_ascii);
 
     const bool person = !site_.keyboard().delivering_sent_keys();
     // A caret the person moved, or a selection they made, since their last keystroke starts
     // the typing afresh.
     if (person && (MskDate.SelStart() != caret_after_key_ || MskDate.SelLength() != 0)) forget_typing();
 
-    if (key_ascii == kAsciiEnter) {
+    if (key_ascii == kCharEnter) {
         key_ascii = 0;
         return;
     }
-    const bool slash = key_ascii == kAsciiSlash && !ctrl_down_ && date_style_ == ddMMyyyy;
+    const bool slash = key_ascii == kCharSlash && !ctrl_down_ && date_style_ == ddMMyyyy;
     if (slash && person && confirm_pending_) {
         // The digit before it already filled the field and carried the caret on: this "/" is
         // the clerk's separator, and the field is complete as typed.
@@ -446,14 +433,14 @@ void KelDateMask::MskDate_KeyPress(int16_t& key_ascii) {
         return;
     }
     // Typing always overwrites: the character at the caret is selected to be replaced.
-    if (key_ascii != kAsciiBackspace) {
+    if (key_ascii != kCharBackspace) {
         prepare_overwrite(key_ascii);
         MskDate.SelLength(1);
     }
     if (ctrl_down_) return;
 
     if (date_style_ == ddMMyyyy) {
-        if (key_ascii == kAsciiSlash) {
+        if (key_ascii == kCharSlash) {
             complete_field(person && typed_field_ != DateField::none &&
                            typed_field_ == DateFieldAt(MskDate.SelStart()));
             forget_typing();
@@ -462,7 +449,7 @@ void KelDateMask::MskDate_KeyPress(int16_t& key_ascii) {
     } else if (date_style_ == mmyyA) {
         if (key_ascii >= 'a' && key_ascii <= 'z') key_ascii = static_cast<int16_t>(key_ascii - ('a' - 'A'));
     }
-    if (person && key_ascii >= 32 && key_ascii <= 255) {
+    if (person && inserts_character(key_ascii)) {
         typed_at_ = first_input_position(MskDate.Mask(), MskDate.SelStart());
         typed_char_ = static_cast<char>(static_cast<uint8_t>(key_ascii));
     }
@@ -471,14 +458,14 @@ void KelDateMask::MskDate_KeyPress(int16_t& key_ascii) {
 void KelDateMask::prepare_overwrite(int16_t key_ascii) {
     const int32_t start = MskDate.SelStart();
     if (MskDate.SelLength() <= 1) return;
-    if (key_ascii == kAsciiSlash) {
+    if (key_ascii == kCharSlash) {
         // Over a selection "/" completes the field where the selection starts.
         MskDate.SelStart(start);
         return;
     }
     // Only a key that will type a character clears the selection: a dropped key, Escape or a
     // Ctrl combination leaves the text as it was.
-    if (key_ascii < 32 || key_ascii > 255 || ctrl_down_) return;
+    if (!inserts_character(key_ascii) || ctrl_down_) return;
     const std::string mask = MskDate.Mask();
     const int32_t at = first_input_position(mask, start);
     if (at < 0 || !mask_fits(static_cast<char>(static_cast<uint8_t>(key_ascii)), mask[static_cast<std::size_t>(at)]))
@@ -512,7 +499,7 @@ void KelDateMask::complete_field(bool typed_here) {
 }
 
 void KelDateMask::MskDate_KeyUp(int16_t& key_code, int16_t& shift) {
-    raise_key_event(kKeyUp, "KeyUp", key_code, shift);
+    raise_key_event(site_, kKeyUp, "KeyUp", key_code, shift);
     validated_ = false;
     if (!site_.keyboard().delivering_sent_keys()) note_typing();
     caret_after_key_ = MskDate.SelLength() == 0 ? MskDate.SelStart() : -1;

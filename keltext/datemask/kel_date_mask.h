@@ -123,7 +123,6 @@ private:
     void forget_typing();
     // Writes a text the mask would not take as typed: empty mask, text, then `mask`.
     void write_unmasked(const std::string& text, const std::string& mask);
-    void raise_key_event(Event number, std::string_view name, int16_t& key_code, int16_t& shift);
     void raise_date_error();
     void fit_width_to_button();
 

@@ -1,12 +1,14 @@
 #pragma once
 // What a control asks of its container, of the keyboard services beside it, and what the
 // container calls on a control. The controls are written against these interfaces only.
+#include <array>
 #include <cstdint>
 #include <memory>
 #include <span>
 #include <string>
 #include <string_view>
 
+#include "keltext/host/conversions.h"
 #include "keltext/host/font.h"
 #include "keltext/host/variant.h"
 #include "keltext/host/widgets.h"
@@ -106,10 +108,33 @@ public:
     virtual Frame& create_frame(std::string_view name) = 0;
 };
 
+// The key events every control raises: the arguments go to the form by reference and are read
+// back as the form left them (returned_int16: a value that does not convert leaves them).
+inline void raise_key_event(Site& site, int number, std::string_view name, int16_t& key_code, int16_t& shift) {
+    std::array<EventArg, 2> args{EventArg{"KeyCode", Variant(key_code)}, EventArg{"Shift", Variant(shift)}};
+    site.raise_event(number, name, args);
+    key_code = returned_int16(args[0].value, key_code);
+    shift = returned_int16(args[1].value, shift);
+}
+
+inline void raise_key_press(Site& site, int number, int16_t& key_ascii) {
+    std::array<EventArg, 1> args{EventArg{"KeyAscii", Variant(key_ascii)}};
+    site.raise_event(number, "KeyPress", args);
+    key_ascii = returned_int16(args[0].value, key_ascii);
+}
+
 // What the container calls on a control. Construction (on its site) builds the constituents;
 // then Initialize, exactly one of InitProperties and ReadProperties, then Resize as needed.
 class Control : public Object {
 public:
+    Control() = default;
+    // A control's widgets call back into it through `this`: a copy or a moved-to control would
+    // hand the original's callbacks a control that is not theirs.
+    Control(const Control&) = delete;
+    Control& operator=(const Control&) = delete;
+    Control(Control&&) = delete;
+    Control& operator=(Control&&) = delete;
+
     virtual void Initialize() {}
     virtual void InitProperties() {}
     virtual void ReadProperties(PropertyBag&) {}

@@ -381,6 +381,34 @@ bool to_bool(const Variant& v) {
     }
 }
 
+namespace {
+
+// The number the checked conversions would read, or nothing where they would raise 13 or 6.
+std::optional<double> convertible_number(const Variant& v) {
+    if (v.is_string()) {
+        const auto r = read_whole(v.str());
+        if (!r || r->overflow) return std::nullopt;
+        return r->value + 0.0;
+    }
+    if (v.is_object()) return std::nullopt;
+    return v.number();
+}
+
+}  // namespace
+
+int16_t returned_int16(const Variant& v, int16_t before) {
+    const auto d = convertible_number(v);
+    if (!d || !std::isfinite(*d)) return before;
+    const double r = round_half_even(*d);
+    return r >= -32768 && r <= 32767 ? static_cast<int16_t>(r) : before;
+}
+
+float returned_single(const Variant& v, float before) {
+    const auto d = convertible_number(v);
+    if (!d || std::isnan(*d) || std::fabs(*d) > FLT_MAX) return before;
+    return static_cast<float>(*d);
+}
+
 bool same_name(std::string_view a, std::string_view b) {
     if (a.size() != b.size()) return false;
     for (size_t i = 0; i < a.size(); ++i) {
@@ -390,6 +418,10 @@ bool same_name(std::string_view a, std::string_view b) {
         if (x != y) return false;
     }
     return true;
+}
+
+bool starts_with_name(std::string_view s, std::string_view prefix) {
+    return s.size() >= prefix.size() && same_name(s.substr(0, prefix.size()), prefix);
 }
 
 std::string name_key(std::string_view name) {

@@ -66,8 +66,17 @@ std::optional<int16_t> stored_int16(const Variant& v);
 std::optional<int32_t> stored_int32(const Variant& v);
 std::optional<bool> stored_bool(const Variant& v);
 
+// An event argument read back after the form's handler ran: the form may have left any kind
+// there. A number of any kind (and a boolean, a date, empty or a numeric text, which the
+// conversions read as numbers) becomes the argument's type by the rules above; a value that
+// does not convert, or is out of the type's range, leaves the argument as it was.
+int16_t returned_int16(const Variant& v, int16_t before);
+float returned_single(const Variant& v, float before);
+
 // Case-insensitive (ASCII) comparison of names: property keys, member names.
 bool same_name(std::string_view a, std::string_view b);
+// True when `s` begins with a same_name of `prefix`.
+bool starts_with_name(std::string_view s, std::string_view prefix);
 // The key under which a name is looked up in a map: two names are the same_name exactly when
 // their keys are equal.
 std::string name_key(std::string_view name);

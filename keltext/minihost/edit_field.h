@@ -95,12 +95,12 @@ protected:
         default: break;
         }
     }
-    // The widget's own part of a key press: Backspace, or a typed character (codes 32 to 255;
-    // other control codes insert nothing).
+    // The widget's own part of a key press: Backspace, or a typed character (other control
+    // codes insert nothing).
     virtual void own_key_press(int16_t char_code) {
-        if (char_code == 8) {
+        if (char_code == kCharBackspace) {
             delete_backward();
-        } else if (char_code >= 32 && char_code <= 255) {
+        } else if (inserts_character(char_code)) {
             type_char(static_cast<char>(static_cast<uint8_t>(char_code)));
         }
     }

@@ -3,6 +3,8 @@
 #include <array>
 #include <utility>
 
+#include "keltext/host/conversions.h"
+
 namespace kel::mini {
 namespace {
 
@@ -45,17 +47,6 @@ constexpr std::array kSymbols = {
 };
 
 char ascii_upper(char c) { return (c >= 'a' && c <= 'z') ? static_cast<char>(c - 'a' + 'A') : c; }
-
-bool equal_nocase(std::string_view a, std::string_view b) {
-    if (a.size() != b.size()) return false;
-    for (std::size_t i = 0; i < a.size(); ++i)
-        if (ascii_upper(a[i]) != ascii_upper(b[i])) return false;
-    return true;
-}
-
-bool starts_nocase(std::string_view s, std::string_view prefix) {
-    return s.size() >= prefix.size() && equal_nocase(s.substr(0, prefix.size()), prefix);
-}
 
 // The character the key of `c` makes with Shift held (US layout), or `c` itself.
 char shifted(char c) {
@@ -107,7 +98,7 @@ Keystroke keystroke_for_char(uint8_t c) {
         k.key_code = static_cast<int16_t>(c);
     } else if (c == ' ') {
         k.key_code = kVkSpace;
-    } else if (c == 8 || c == 13 || c == 27) {
+    } else if (c == kVkBackspace || c == kVkEnter || c == kVkEscape) {
         // The control codes that have keys of their own: Backspace, Enter, Escape.
         k.key_code = static_cast<int16_t>(c);
     } else {
@@ -127,13 +118,13 @@ std::optional<Keystroke> parse_key(std::string_view name) {
     int16_t prefixes = 0;
     for (;;) {
         if (name.size() <= 1) break;
-        if (starts_nocase(name, "Shift+")) {
+        if (starts_with_name(name, "Shift+")) {
             prefixes |= kShiftMask;
             name.remove_prefix(6);
-        } else if (starts_nocase(name, "Ctrl+")) {
+        } else if (starts_with_name(name, "Ctrl+")) {
             prefixes |= kCtrlMask;
             name.remove_prefix(5);
-        } else if (starts_nocase(name, "Alt+")) {
+        } else if (starts_with_name(name, "Alt+")) {
             prefixes |= kAltMask;
             name.remove_prefix(4);
         } else {
@@ -146,7 +137,7 @@ std::optional<Keystroke> parse_key(std::string_view name) {
     Keystroke k;
     bool found = false;
     for (const auto& nk : kNamedKeys) {
-        if (equal_nocase(nk.name, name)) {
+        if (same_name(nk.name, name)) {
             k.key_code = nk.code;
             if (nk.char_code != 0) k.char_code = nk.char_code;
             found = true;
@@ -191,7 +182,7 @@ constexpr std::array kSendTokens = {
 // The keystroke a {TOKEN} names, or nothing.
 std::optional<SentKey> send_token(std::string_view token, int16_t prefixes) {
     SentKey sk;
-    if (equal_nocase(token, "TAB")) {
+    if (same_name(token, "TAB")) {
         sk.kind = (prefixes & kShiftMask) != 0 ? SentKey::back_tab : SentKey::tab;
         sk.key.key_code = kVkTab;
         sk.key.shift = prefixes;
@@ -202,7 +193,7 @@ std::optional<SentKey> send_token(std::string_view token, int16_t prefixes) {
         return sk;
     }
     for (const auto& t : kSendTokens) {
-        if (equal_nocase(t.name, token)) {
+        if (same_name(t.name, token)) {
             sk.key.key_code = t.code;
             sk.key.shift = prefixes;
             if (t.char_code != 0 && (prefixes & (kCtrlMask | kAltMask)) == 0) sk.key.char_code = t.char_code;

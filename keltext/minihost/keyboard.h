@@ -8,19 +8,9 @@
 #include <string_view>
 #include <vector>
 
+#include "keltext/host/keys.h"
+
 namespace kel::mini {
-
-enum : int16_t {
-    kShiftMask = 1,
-    kCtrlMask = 2,
-    kAltMask = 4,
-};
-
-enum VirtualKey : int16_t {
-    kVkBackspace = 8, kVkTab = 9, kVkEnter = 13, kVkEscape = 27, kVkSpace = 32, kVkPageUp = 33,
-    kVkPageDown = 34, kVkEnd = 35, kVkHome = 36, kVkLeft = 37, kVkUp = 38, kVkRight = 39, kVkDown = 40,
-    kVkInsert = 45, kVkDelete = 46, kVkF1 = 112, kVkF12 = 123, kVkNumLock = 144,
-};
 
 // One keystroke: key down and key up with key_code and shift, and a key press in between
 // when the key makes a character.

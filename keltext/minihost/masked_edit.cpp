@@ -108,7 +108,7 @@ void MiniMaskedEdit::own_key_down(int16_t key_code, int16_t shift) {
 void MiniMaskedEdit::own_key_press(int16_t char_code) {
     if (mask_.empty()) return EditFieldImpl::own_key_press(char_code);
     std::string before = text_;
-    if (char_code == 8) {
+    if (char_code == kCharBackspace) {
         if (sel_length_ > 0) {
             remove_selection();
         } else {
@@ -118,7 +118,7 @@ void MiniMaskedEdit::own_key_press(int16_t char_code) {
             remove_at(pos);
             sel_start_ = pos;
         }
-    } else if (char_code >= 32 && char_code <= 255) {
+    } else if (inserts_character(char_code)) {
         // Typing overwrites the position; a selection only says where typing starts.
         if (!put_char(static_cast<char>(static_cast<uint8_t>(char_code)))) return;
     } else {

@@ -27,6 +27,8 @@ Variant coerce_like(const Variant& value, const Variant& given) {
         case VarKind::Empty: return value;
         }
     } catch (const RuntimeError&) {
+        // 13 or 6: the form left a value that does not convert to the kind; the control's
+        // value stands. Which values convert is the conversions' own rule, so it is asked.
     }
     return given;
 }

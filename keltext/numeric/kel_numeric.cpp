@@ -5,6 +5,7 @@
 
 #include "keltext/host/conversions.h"
 #include "keltext/host/errors.h"
+#include "keltext/host/keys.h"
 #include "keltext/numeric/number_format.h"
 
 namespace kel {
@@ -13,7 +14,6 @@ namespace {
 constexpr Colour kDefaultForeColor = 0xC00000;
 constexpr Colour kDefaultBackColor = 0xFFECC8;
 constexpr int16_t kDefaultMaxLength = 7;
-constexpr int16_t kVkInsert = 45;
 
 // Sizes in twips.
 constexpr float kButtonsFromRight = 300;
@@ -24,17 +24,6 @@ constexpr float kGapButtonsSetter = 320;
 constexpr float kGapButtonsResize = 310;
 constexpr float kGapNoButtons = 60;
 constexpr float kCharWidth = 120;
-
-// A by-reference argument as the form left it; a value the form put there that does not fit
-// the argument's type leaves the argument as it was.
-int16_t returned_int16(const Variant& v, int16_t fallback) {
-    if (const int16_t* p = v.get_if<int16_t>()) return *p;
-    try {
-        return to_int16(v);
-    } catch (const RuntimeError&) {
-        return fallback;
-    }
-}
 
 }  // namespace
 
@@ -159,18 +148,13 @@ void KelNumeric::Font(std::shared_ptr<kel::Font> f) {
 int16_t KelNumeric::MaxLength() const { return mMaxLength; }
 
 void KelNumeric::MaxLength(int16_t n) {
-    // A limit the text box refuses leaves its previous one, and the setter goes on with that.
-    try {
-        txtNumeric.MaxLength(n);
-    } catch (const RuntimeError&) {
-    }
+    // A negative limit is one the text box refuses: it keeps its previous one, and the setter
+    // goes on with that.
+    if (n >= 0) txtNumeric.MaxLength(n);
     int32_t limit = txtNumeric.MaxLength();
     // The limit always leaves room for the point and the decimals.
     if (limit <= mNoOfDecimals && mNoOfDecimals < 32767) {
-        try {
-            txtNumeric.MaxLength(mNoOfDecimals + 1);
-        } catch (const RuntimeError&) {
-        }
+        if (mNoOfDecimals + 1 >= 0) txtNumeric.MaxLength(mNoOfDecimals + 1);
         limit = txtNumeric.MaxLength();
     }
     mMaxLength = static_cast<int16_t>(std::clamp<int32_t>(limit, -32768, 32767));
@@ -280,12 +264,15 @@ void KelNumeric::InitProperties() {
 namespace {
 
 // Each restored value is applied on its own: one that cannot be used leaves its property as it
-// was, and the restore goes on with the next.
+// was, and the restore goes on with the next. What a property bag holds is not known in advance
+// (another host may have written it), so the step is tried: the errors expected are 13 and 6
+// from a stored value that does not convert, and 380 from a value the property refuses.
 template <class F>
 void restore_step(F&& step) {
     try {
         step();
     } catch (const RuntimeError&) {
+        // skipped: the property keeps its value
     }
 }
 
@@ -387,24 +374,20 @@ void KelNumeric::EnterFocus() {
 void KelNumeric::txtNumeric_GotFocus() {
     if (!mTxtFormat) return;
     txtNumeric.Text(StripGrouping(txtNumeric.Text()));
-    try {
-        txtNumeric.MaxLength(mMaxLength);
-    } catch (const RuntimeError&) {
-    }
+    if (mMaxLength >= 0) txtNumeric.MaxLength(mMaxLength);
 }
 
 void KelNumeric::ExitFocus() { FormatOnExit(); }
 
 void KelNumeric::FormatOnExit() {
-    const std::string text = txtNumeric.Text();
-    apply(format_on_exit(edit_state(text)));
+    apply(format_on_exit(edit_state()));
 }
 
 // ---- keystroke path -------------------------------------------------------------------------------
 
-NumericEdit KelNumeric::edit_state(const std::string& text) const {
+NumericEdit KelNumeric::edit_state() const {
     NumericEdit e;
-    e.text = text;
+    e.text = txtNumeric.Text();
     e.caret = txtNumeric.SelStart();
     e.sel_length = txtNumeric.SelLength();
     e.limit = txtNumeric.MaxLength();
@@ -433,10 +416,7 @@ void KelNumeric::apply(const NumericDecision& d) {
                 txtNumeric.SelLength(s.value);
                 break;
             case EditStep::Kind::max_length:
-                try {
-                    txtNumeric.MaxLength(s.value);
-                } catch (const RuntimeError&) {
-                }
+                if (s.value >= 0) txtNumeric.MaxLength(s.value);  // the box refuses a negative limit
                 break;
             case EditStep::Kind::send_keys:
                 site_.keyboard().send_keys(s.keys);
@@ -444,29 +424,22 @@ void KelNumeric::apply(const NumericDecision& d) {
             case EditStep::Kind::control_error:
                 site_.raise_event(kControlError, "ControlError", {});
                 break;
-            case EditStep::Kind::save_old_text:
-                OldText = txtNumeric.Text();
-                break;
         }
     }
 }
 
 void KelNumeric::txtNumeric_KeyDown(int16_t& key_code, int16_t& shift) {
-    raise_key_event(kKeyDown, "KeyDown", key_code, shift);
-    const std::string text = txtNumeric.Text();
-    NumericDecision d = numeric_key_down(edit_state(text), key_code, shift);
+    raise_key_event(site_, kKeyDown, "KeyDown", key_code, shift);
+    NumericDecision d = numeric_key_down(edit_state(), key_code, shift);
     apply(d);
     key_code = d.key;
     if (CtrlDown) return;
-    raise_key_event(kKeyDown, "KeyDown", key_code, shift);
+    raise_key_event(site_, kKeyDown, "KeyDown", key_code, shift);
 }
 
 void KelNumeric::txtNumeric_KeyPress(int16_t& key_ascii) {
-    std::array<EventArg, 1> args{{{"KeyAscii", Variant(key_ascii)}}};
-    site_.raise_event(kKeyPress, "KeyPress", args);
-    key_ascii = returned_int16(args[0].value, key_ascii);
-    const std::string text = txtNumeric.Text();
-    NumericEdit e = edit_state(text);
+    raise_key_press(site_, kKeyPress, key_ascii);
+    NumericEdit e = edit_state();
     // The filter reads the Insert key's state afresh for each keystroke; the decision says
     // whether the filter ran and so whether OverwriteMode takes the new state.
     e.overwrite = site_.keyboard().key_state(kVkInsert) == 1;
@@ -476,7 +449,7 @@ void KelNumeric::txtNumeric_KeyPress(int16_t& key_ascii) {
 }
 
 void KelNumeric::txtNumeric_KeyUp(int16_t& key_code, int16_t& shift) {
-    raise_key_event(kKeyUp, "KeyUp", key_code, shift);
+    raise_key_event(site_, kKeyUp, "KeyUp", key_code, shift);
 }
 
 void KelNumeric::txtNumeric_Change() { site_.raise_event(kChange, "Change", {}); }
@@ -487,13 +460,6 @@ void KelNumeric::txtNumeric_Click() {
 
 void KelNumeric::txtNumeric_DblClick() {
     if (mEnabled && !mLocked) site_.raise_event(kDblClick, "DblClick", {});
-}
-
-void KelNumeric::raise_key_event(Event number, std::string_view name, int16_t& key_code, int16_t& shift) {
-    std::array<EventArg, 2> args{{{"KeyCode", Variant(key_code)}, {"Shift", Variant(shift)}}};
-    site_.raise_event(number, name, args);
-    key_code = returned_int16(args[0].value, key_code);
-    shift = returned_int16(args[1].value, shift);
 }
 
 }  // namespace kel

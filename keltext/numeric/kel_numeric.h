@@ -99,11 +99,10 @@ private:
     void LayoutConstituents();
     void FormatOnExit();
 
-    // The edit state the rules decide on; `text` must outlive the returned state.
-    NumericEdit edit_state(const std::string& text) const;
+    // The edit state the rules decide on: a copy of the box's text and settings.
+    NumericEdit edit_state() const;
     // Applies a decision's writes in order, through the widgets.
     void apply(const NumericDecision& d);
-    void raise_key_event(Event number, std::string_view name, int16_t& key_code, int16_t& shift);
     double min_number() const;
     double max_number() const;
 
@@ -125,7 +124,6 @@ private:
     // Run-time state carried from one notification to the next.
     bool CtrlDown = false;
     bool OverwriteMode = false;
-    std::string OldText;
 };
 
 }  // namespace kel

@@ -3,6 +3,7 @@
 #include <algorithm>
 
 #include "keltext/host/conversions.h"
+#include "keltext/host/typing.h"
 #include "keltext/numeric/number_format.h"
 
 namespace kel {
@@ -12,70 +13,64 @@ constexpr std::string_view kDigits = "0123456789";
 constexpr std::string_view kDigitsAndPoint = "0123456789.";
 constexpr std::string_view kSelectionSet = "1234567890.";
 
-constexpr int kBackspace = 8;
-constexpr int kPoint = 46;
-
-bool in_set(int key, std::string_view set) {
-    // Codes outside the byte range have no character and are never accepted.
-    if (key <= 0 || key > 255) return false;
-    return set.find(static_cast<char>(key)) != std::string_view::npos;
-}
+constexpr int kBackspace = kCharBackspace;
+constexpr int kPoint = kCharPoint;
 
 // The edit box as the rule sees it while it decides: each write is recorded as a step and
 // mirrored here the way the edit box applies it, so later steps read what the box would show.
 class Work {
 public:
-    Work(const NumericEdit& e, NumericDecision& d) : text_(e.text), d_(d) {
+    Work(const NumericEdit& e, NumericDecision& d) : edit_(e), d_(d) {
         int len = this->len();
         caret_ = std::clamp(e.caret, 0, len);
         sel_ = std::clamp(e.sel_length, 0, len - caret_);
     }
 
-    std::string_view text() const { return text_; }
-    int len() const { return static_cast<int>(text_.size()); }
+    // The text as the box would show it: the last text the rule wrote, or the one it began
+    // with. Looked up each time rather than kept as a view, so nothing points into the steps.
+    std::string_view text() const { return text_step_ ? d_.steps()[*text_step_].text : edit_.text; }
+    int len() const { return static_cast<int>(text().size()); }
     int caret() const { return caret_; }
     int sel() const { return sel_; }
     // Position (from 1) of the first ".", 0 when there is none.
     int dot() const {
-        std::size_t p = text_.find('.');
+        std::size_t p = text().find('.');
         return p == std::string_view::npos ? 0 : static_cast<int>(p) + 1;
     }
     // The character at a position counted from 1; '\0' outside the text, where a read of the
     // character is a step that does not happen.
-    char at(int pos) const { return pos >= 1 && pos <= len() ? text_[static_cast<std::size_t>(pos - 1)] : '\0'; }
+    char at(int pos) const { return pos >= 1 && pos <= len() ? text()[static_cast<std::size_t>(pos - 1)] : '\0'; }
 
     // A new text puts the caret at the start; the same text leaves everything as it is.
     void set_text(std::string t) {
-        if (t == text_) return;
+        if (t == text()) return;
         EditStep s;
         s.kind = EditStep::Kind::text;
         s.text = std::move(t);
-        if (const EditStep* kept = push(std::move(s))) {
-            text_ = kept->text;  // the step array never moves while the rule runs
-            caret_ = 0;
-            sel_ = 0;
-        }
+        d_.push(std::move(s));
+        text_step_ = d_.steps().size() - 1;
+        caret_ = 0;
+        sel_ = 0;
     }
     void set_caret(int v) {
         if (v < 0) return;  // the box refuses it; the rule goes on
         caret_ = std::min(v, len());
         sel_ = 0;
-        push(step(EditStep::Kind::caret, v));
+        d_.push(step(EditStep::Kind::caret, v));
     }
     void set_sel_length(int v) {
         if (v < 0) return;
         sel_ = std::min(v, len() - caret_);
-        push(step(EditStep::Kind::sel_length, v));
+        d_.push(step(EditStep::Kind::sel_length, v));
     }
-    void set_max_length(int v) { push(step(EditStep::Kind::max_length, v)); }
+    void set_max_length(int v) { d_.push(step(EditStep::Kind::max_length, v)); }
     void send(std::string_view keys) {
         EditStep s;
         s.kind = EditStep::Kind::send_keys;
         s.keys = keys;
-        push(std::move(s));
+        d_.push(std::move(s));
     }
-    void control_error() { push(step(EditStep::Kind::control_error, 0)); }
-    void save_old_text() { push(step(EditStep::Kind::save_old_text, 0)); }
+    void control_error() { d_.push(step(EditStep::Kind::control_error, 0)); }
 
 private:
     static EditStep step(EditStep::Kind kind, int value) {
@@ -84,13 +79,9 @@ private:
         s.value = value;
         return s;
     }
-    const EditStep* push(EditStep s) {
-        std::size_t before = d_.steps().size();
-        d_.push(std::move(s));
-        return d_.steps().size() > before ? &d_.steps().back() : nullptr;
-    }
 
-    std::string_view text_;
+    const NumericEdit& edit_;
+    std::optional<std::size_t> text_step_;  // index of the last text write, if any
     int caret_ = 0;
     int sel_ = 0;
     NumericDecision& d_;
@@ -110,8 +101,9 @@ std::string_view ltrim_blanks(std::string_view t) {
 
 // The filter proper, on the working state; returns the code left to the edit box.
 int filter_key(Work& w, const NumericEdit& e, int key) {
+    // The text before the key: what the range check puts back. It is the edit state's own
+    // text or a step already written, neither of which moves while the rule runs.
     const std::string_view old_text = w.text();
-    w.save_old_text();
 
     const int len = w.len();
     const int start_caret = w.caret();
@@ -123,11 +115,11 @@ int filter_key(Work& w, const NumericEdit& e, int key) {
 
     if (e.decimals == 0) {
         if (e.overwrite) w.set_sel_length(1);
-        if (!in_set(key, kDigits) && key != kBackspace) {
+        if (!in_set(kDigits, key) && key != kBackspace) {
             key = 0;
             if (e.trigger_error) w.control_error();
         }
-    } else if (!in_set(key, kDigitsAndPoint) && key != kBackspace) {
+    } else if (!in_set(kDigitsAndPoint, key) && key != kBackspace) {
         key = 0;
         if (e.trigger_error) w.control_error();
     } else {
@@ -219,7 +211,7 @@ int filter_key(Work& w, const NumericEdit& e, int key) {
 }
 
 int replace_selection(Work& w, const NumericEdit& e, int key) {
-    if (!in_set(key, kSelectionSet) && key != kBackspace) return 0;
+    if (!in_set(kSelectionSet, key) && key != kBackspace) return 0;
 
     const std::string_view text = w.text();
     const int caret = w.caret();
@@ -290,22 +282,21 @@ NumericDecision numeric_key_down(const NumericEdit& e, int16_t key_code, int16_t
     NumericDecision d;
     Work w(e, d);
     int key = key_code;
-    if (key == 191) w.set_text("");  // the "/?" key clears the box; the key itself goes on
-    bool ctrl = (shift & 2) != 0;
+    if (key == kVkSlash) w.set_text("");  // the "/?" key clears the box; the key itself goes on
+    bool ctrl = (shift & kCtrlMask) != 0;
     d.ctrl_down = ctrl;
     if (ctrl) {
         d.key = key_code;
         return d;
     }
-    if (key == 38) {
+    if (key == kVkUp) {
         w.send(kKeysBackTab);
         key = 0;
-    } else if (key == 40) {
+    } else if (key == kVkDown) {
         w.send(kKeysTab);
         key = 0;
     }
-    w.save_old_text();
-    if (key == 46) {
+    if (key == kVkDelete) {
         if (w.text() == ".") {
             w.set_text("");
         } else {
@@ -361,7 +352,7 @@ bool digit_beyond_precision(const NumericEdit& e, const Work& w, int typed, int 
     const auto caret = static_cast<std::size_t>(w.caret());
     const char inserted = static_cast<char>(key);
     const int digits = significant_integer_digits(
-        joined(text.substr(0, caret), key >= 32 && key <= 255 ? std::string_view(&inserted, 1) : std::string_view{},
+        joined(text.substr(0, caret), inserts_character(key) ? std::string_view(&inserted, 1) : std::string_view{},
                text.substr(caret + static_cast<std::size_t>(w.sel()))));
     return digits > significant_integer_digits(e.text) && digits + std::max(e.decimals, 0) > kMaxSignificantDigits;
 }
@@ -380,12 +371,12 @@ NumericDecision refused_digit(const NumericEdit& e, std::optional<bool> overwrit
 // The key press as the rules decide it, on the working state; the decision's key is set.
 void decide_key_press(NumericDecision& d, Work& w, const NumericEdit& e, int16_t key_ascii, bool ctrl_down) {
     int key = key_ascii;
-    if (key == 9 || key == 10) {
+    if (key == kCharTab || key == kCharLineFeed) {
         d.key = key_ascii;
         return;
     }
-    if (key == 13) return;
-    if (key == 47) {
+    if (key == kCharEnter) return;
+    if (key == kCharSlash) {
         w.set_text("");
         return;
     }

@@ -10,14 +10,17 @@
 #include <cstdint>
 #include <optional>
 #include <span>
+#include <stdexcept>
 #include <string>
 #include <string_view>
+
+#include "keltext/host/keys.h"
 
 namespace kel {
 
 // What a handler reads from the edit box and the control before a decision.
 struct NumericEdit {
-    std::string_view text;
+    std::string text;
     int32_t caret = 0;       // SelStart
     int32_t sel_length = 0;  // SelLength
     int32_t limit = 0;       // the edit box's current length limit
@@ -33,34 +36,42 @@ struct NumericEdit {
 // One write the control makes, in order. A text write goes through the edit box, which puts
 // the caret at the start and raises Change when the text differs.
 struct EditStep {
-    // save_old_text: OldText = the edit text as it stands at this point.
-    enum class Kind : uint8_t { text, caret, sel_length, max_length, send_keys, control_error, save_old_text };
+    enum class Kind : uint8_t { text, caret, sel_length, max_length, send_keys, control_error };
     Kind kind = Kind::text;
     int32_t value = 0;       // caret, sel_length, max_length
     std::string text;        // text
-    std::string_view keys;   // send_keys: one of the literals below
+    std::string_view keys;   // send_keys: one of the host's literals (host/keys.h)
 };
 
-inline constexpr std::string_view kKeysEnd = "{END}";
-inline constexpr std::string_view kKeysDel = "{DEL}";
-inline constexpr std::string_view kKeysTab = "{TAB}";
-inline constexpr std::string_view kKeysBackTab = "+{TAB}";
+// The writes of one decision, in order, held in place: a keystroke allocates nothing beyond
+// the text it produces. No rule makes more than kCapacity writes (a test runs every key over
+// the boxes that make the most); one more is a fault in the rules, and fails loudly rather
+// than being dropped.
+class EditSteps {
+public:
+    static constexpr std::size_t kCapacity = 12;
+
+    void push(EditStep step) {
+        if (count_ == kCapacity) throw std::logic_error("a numeric decision makes more than 12 writes");
+        steps_[count_++] = std::move(step);
+    }
+    std::span<const EditStep> view() const { return {steps_.data(), count_}; }
+
+private:
+    std::array<EditStep, kCapacity> steps_{};
+    std::size_t count_ = 0;
+};
 
 struct NumericDecision {
     int16_t key = 0;                    // key code (key down) or character (key press) left to the edit box
     std::optional<bool> ctrl_down;      // key down: the new CtrlDown
     std::optional<bool> overwrite;      // key press: the new OverwriteMode, when the filter ran
 
-    std::span<const EditStep> steps() const { return {steps_.data(), count_}; }
-    void push(EditStep step) {
-        if (count_ < steps_.size()) steps_[count_++] = std::move(step);
-    }
+    std::span<const EditStep> steps() const { return writes_.view(); }
+    void push(EditStep step) { writes_.push(std::move(step)); }
 
 private:
-    // No decision makes more writes than this; fixed so that a keystroke allocates nothing
-    // beyond the text it produces.
-    std::array<EditStep, 12> steps_{};
-    std::size_t count_ = 0;
+    EditSteps writes_;
 };
 
 // The integer digits allowed before the point: the box's limit less the decimals and the point.

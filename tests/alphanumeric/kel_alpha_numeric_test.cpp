@@ -143,6 +143,38 @@ TEST_F(AlphaTest, CaretAfterBackspaceAndDelete) {
     EXPECT_TRUE(rec.errors.empty());
 }
 
+TEST_F(AlphaTest, ChangeHandlerSeesTheCaretAlreadyPlaced) {
+    // The form's Change handler reads SelStart: by then the caret stands where the keystroke
+    // leaves it, whether the filter wrote the text (title case) or the edit box did.
+    struct Case {
+        int32_t type;
+        const char* start;
+        int32_t caret;
+        const char* key;
+        int32_t seen;
+    } cases[] = {
+        {KelANTitleCase, "ab", 1, "x", 2},
+        {KelANUpperCase, "ab", 1, "x", 2},
+        {KelANUserKeys, "abc", 2, "Backspace", 1},
+        {KelANUserKeys, "abc", 1, "Delete", 1},
+    };
+    int n = 0;
+    for (const Case& c : cases) {
+        HostedControl& a = add("h" + std::to_string(n++));
+        set(a, "TextType", Variant(c.type));
+        set(a, "Text", Variant(c.start));
+        form.focus(&a);
+        form.select(a, c.caret, 0);
+        std::vector<int32_t> seen;
+        rec.on_event = [&](std::string_view event, std::span<EventArg>) {
+            if (event == "Change") seen.push_back(caret(a));
+        };
+        key(c.key);
+        rec.on_event = nullptr;
+        EXPECT_EQ(seen, std::vector<int32_t>{c.seen}) << c.start << " " << c.key;
+    }
+}
+
 TEST_F(AlphaTest, LongTextKeepsTheCaretRight) {
     HostedControl& a = add();
     set(a, "TextType", Variant(int32_t{KelANUpperCase}));
@@ -205,6 +237,9 @@ INSTANTIATE_TEST_SUITE_P(
         ClampCase{"InsideRange", KelANDigits, Variant(int16_t{500}), Variant(int16_t{10}), "250", "250"},
         ClampCase{"BlankInsideUnderMax", KelANDigits, Variant(int16_t{2000}), Variant(int16_t{0}), "1 500", "1 500"},
         ClampCase{"BlankInsideOverMax", KelANDigits, Variant(int16_t{1000}), Variant(int16_t{0}), "1 500", "1000"},
+        // Exactly on a bound is inside the range: the text stays as typed.
+        ClampCase{"OnMax", KelANDigits, Variant(int16_t{500}), Variant(int16_t{10}), "0500", "0500"},
+        ClampCase{"OnMin", KelANDigits, Variant(int16_t{500}), Variant(int16_t{10}), "010", "010"},
         // Limits given as text are compared by value and written back as given.
         ClampCase{"MaxAsText", KelANDigits, Variant("1000"), Variant(int16_t{0}), "900", "900"},
         ClampCase{"MaxWithDecimals", KelANDigits, Variant(2.5), Variant(int16_t{0}), "3", "2.5"},

@@ -138,6 +138,29 @@ TEST_F(ComboTest, AFullListLoadsTheFirstEntriesAndSavesThemAll) {
     EXPECT_EQ(ctl(c).List(Variant(int16_t{32766})), Variant("more"));
 }
 
+// ---- focus -------------------------------------------------------------------------------------
+
+TEST_F(ComboTest, FocusEntryKeepsASelectionMadeBeforeIt) {
+    struct Case {
+        int32_t start, length;          // the selection code makes before focus arrives
+        int32_t sel_start, sel_length;  // what focus entry leaves
+    } cases[] = {
+        {3, 0, 0, 4},  // nothing selected: all of the text but its trailing spaces
+        {1, 2, 1, 2},  // a selection already made stands
+        {0, 6, 0, 6},
+    };
+    int n = 0;
+    for (const Case& c : cases) {
+        HostedControl& h = add({}, "f" + std::to_string(n++));
+        set(h, "Text", Variant("Cash  "));
+        set(h, "SelStart", Variant(c.start));
+        set(h, "Sellength", Variant(c.length));
+        form.focus(&h);
+        EXPECT_EQ(peek(h, "SelStart"), Variant(c.sel_start)) << c.start << "+" << c.length;
+        EXPECT_EQ(peek(h, "SelLength"), Variant(c.sel_length)) << c.start << "+" << c.length;
+    }
+}
+
 // ---- searching as the user types --------------------------------------------------------------
 
 TEST_F(ComboTest, KeysThatNeverComplete) {

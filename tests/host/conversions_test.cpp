@@ -240,13 +240,24 @@ TEST(WholeConversions, FromVariantKinds) {
         {Variant("&HFFFF"), -6},  // hexadecimal text is its unsigned value
         {Variant("1e3"), 1000}, {Variant("1e999"), -6}, {Variant("40000"), -6}, {Variant(""), -13},
         {Variant(" "), -13}, {Variant("abc"), -13}, {Variant("12abc"), -13}, {Variant("1.2.3"), -13},
-        {Variant(std::make_shared<Object>()), -13},
+        {Variant(std::make_shared<Object>()), -13}, {Variant(int16_t{-32768}), -32768}, {Variant(32767.4), 32767},
+        {Variant(-32768.5), -32768}, {Variant(32767.5), -6}, {Variant(3.5), 4}, {Variant(1e300), -6},
     };
+    // An event argument the form changed reads back by the same rule; where the conversion
+    // would fail, the argument keeps the value it had.
+    constexpr int16_t kKept = 777;
     for (const auto& c : cases) {
         int got = 0;
-        if (const int error = error_of([&] { got = to_int16(c.value); })) got = -error;
-        EXPECT_EQ(got, c.expected) << text_of(c.value.is_object() ? Variant("object") : c.value);
+        const int error = error_of([&] { got = to_int16(c.value); });
+        if (error) got = -error;
+        const std::string shown = text_of(c.value.is_object() ? Variant("object") : c.value);
+        EXPECT_EQ(got, c.expected) << shown;
+        EXPECT_EQ(returned_int16(c.value, kKept), error ? kKept : c.expected) << shown;
     }
+    EXPECT_EQ(returned_single(Variant("2.5"), 9.0f), 2.5f);
+    EXPECT_EQ(returned_single(Variant(int16_t{-3}), 9.0f), -3.0f);
+    EXPECT_EQ(returned_single(Variant("x"), 9.0f), 9.0f);
+    EXPECT_EQ(returned_single(Variant(1e300), 9.0f), 9.0f);
 }
 
 TEST(CheckedConversions, DoubleAndSingle) {

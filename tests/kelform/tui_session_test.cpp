@@ -13,9 +13,7 @@
 namespace kel::kelform {
 namespace {
 
-using mini::kAltMask;
-using mini::kShiftMask;
-constexpr int16_t kF2 = mini::kVkF1 + 1, kF4 = mini::kVkF1 + 3, kF10 = mini::kVkF1 + 9;
+constexpr int16_t kF2 = kVkF1 + 1, kF4 = kVkF1 + 3, kF10 = kVkF1 + 9;
 
 // Rows of the demo form's fields.
 constexpr int kPayeeRow = 2, kAmountRow = 6, kDateRow = 8, kPayModeRow = 10, kPeriodRow = 14;
@@ -33,7 +31,7 @@ protected:
         for (char32_t c : text) session->handle(Input::char_of(c));
     }
     void tab(int times = 1) {
-        for (int i = 0; i < times; ++i) key(mini::kVkTab);
+        for (int i = 0; i < times; ++i) key(kVkTab);
     }
     Canvas screen(int rows = 24, int cols = 80) {
         Canvas c(rows, cols);
@@ -75,7 +73,7 @@ TEST_F(SessionTest, TheVoucherDateStaysInTheFinancialYear) {
     type(U"01012020");
     tab();
     EXPECT_EQ(text("VoucherDate"), Variant("01/04/2026"));
-    key(mini::kVkTab, kShiftMask);
+    key(kVkTab, kShiftMask);
     type(U"15062027");
     tab();
     EXPECT_EQ(text("VoucherDate"), Variant("31/03/2027"));
@@ -84,20 +82,20 @@ TEST_F(SessionTest, TheVoucherDateStaysInTheFinancialYear) {
 TEST_F(SessionTest, TheComboListOpensWithAltDownAndEscapeOnlyClosesIt) {
     tab(4);
     ASSERT_EQ(focused(), "PayMode");
-    key(mini::kVkDown, kAltMask);
+    key(kVkDown, kAltMask);
     ASSERT_TRUE(session->list_open());
     EXPECT_TRUE(logged("event PayMode.DropDown"));
-    key(mini::kVkDown);
-    key(mini::kVkDown);
-    key(mini::kVkEnter);
+    key(kVkDown);
+    key(kVkDown);
+    key(kVkEnter);
     EXPECT_FALSE(session->list_open());
     EXPECT_EQ(text("PayMode"), Variant("Card"));
     EXPECT_EQ(form.find("PayMode")->dispatch().get("ListIndex"), Variant(int16_t{2}));
 
     key(kF4);
     ASSERT_TRUE(session->list_open());
-    key(mini::kVkUp);
-    key(mini::kVkEscape);  // closes the list only
+    key(kVkUp);
+    key(kVkEscape);  // closes the list only
     EXPECT_FALSE(session->list_open());
     EXPECT_EQ(text("PayMode"), Variant("Card"));
     EXPECT_EQ(focused(), "PayMode");
@@ -110,8 +108,8 @@ TEST_F(SessionTest, TheCalendarButtonOpensAMonthAndPicksADay) {
     // CalendarPosition 2, bottom left: the month hangs under the box.
     Canvas c = screen();
     EXPECT_NE(c.row_text(kDateRow + 2).find("December 2026"), std::string::npos) << c.row_text(kDateRow + 2);
-    key(mini::kVkRight);
-    key(mini::kVkEnter);
+    key(kVkRight);
+    key(kVkEnter);
     EXPECT_FALSE(session->calendar_open());
     EXPECT_EQ(text("VoucherDate"), Variant("07/12/2026"));
     EXPECT_EQ(focused(), "VoucherDate");
@@ -119,11 +117,11 @@ TEST_F(SessionTest, TheCalendarButtonOpensAMonthAndPicksADay) {
     // Days outside the financial year cannot be picked.
     key(kF4);
     ASSERT_TRUE(session->calendar_open());
-    for (int i = 0; i < 4; ++i) key(mini::kVkPageDown);
-    key(mini::kVkEnter);
+    for (int i = 0; i < 4; ++i) key(kVkPageDown);
+    key(kVkEnter);
     EXPECT_TRUE(session->calendar_open());
     EXPECT_NE(session->status().find("pick a day 01/04/2026 to 31/03/2027"), std::string::npos) << session->status();
-    key(mini::kVkEscape);
+    key(kVkEscape);
     EXPECT_FALSE(session->calendar_open());
     EXPECT_EQ(text("VoucherDate"), Variant("07/12/2026"));
 }
@@ -157,8 +155,8 @@ TEST_F(SessionTest, StatusLineExplainsRefusedKeys) {
     EXPECT_EQ(text("Amount"), Variant(12.0));
 
     // A character outside Windows-1252 is refused; one inside it is typed.
-    key(mini::kVkTab, kShiftMask);
-    key(mini::kVkTab, kShiftMask);
+    key(kVkTab, kShiftMask);
+    key(kVkTab, kShiftMask);
     ASSERT_EQ(focused(), "Payee");
     type(U"\u65e5");
     EXPECT_EQ(session->status(), "'\u65e5' cannot be typed here: the form holds Windows-1252 text");
@@ -177,9 +175,9 @@ TEST_F(SessionTest, TheFormSaysWhenLeavingChangedTheValueTyped) {
     type(U"31/04/2026");  // no 31 April: corrected
     tab();
     EXPECT_EQ(session->status(), "Voucher date: 31/04/2026 was changed to 30/04/2026");
-    key(mini::kVkTab, kShiftMask);
+    key(kVkTab, kShiftMask);
     type(U"5/8/26");  // only completed: no change of value
-    key(mini::kVkTab, kShiftMask);
+    key(kVkTab, kShiftMask);
     EXPECT_EQ(session->status(), "");
     type(U"2500");  // only grouped and padded
     tab();
@@ -211,10 +209,10 @@ TEST_F(SessionTest, SmallScreensScrollAndSaySoWhenTooSmall) {
 TEST_F(SessionTest, InsertTogglesOverwriteShownOnTheStatusLine) {
     Canvas c = screen();
     EXPECT_NE(c.row_text(23).find("INS"), std::string::npos);
-    key(mini::kVkInsert);
+    key(kVkInsert);
     EXPECT_NE(screen().row_text(23).find("OVR"), std::string::npos);
     type(U"abc");
-    key(mini::kVkHome);
+    key(kVkHome);
     type(U"x");
     EXPECT_EQ(text("Payee"), Variant("Xbc"));
 }
@@ -237,7 +235,7 @@ TEST_F(SessionTest, ClicksFocusFieldsAndPressTheSpinButtons) {
     click_on(kAmountRow, U'▼');
     click_on(kAmountRow, U'▼');
     EXPECT_EQ(text("Amount"), Variant(400.0));
-    key(mini::kVkUp, kAltMask);
+    key(kVkUp, kAltMask);
     EXPECT_EQ(text("Amount"), Variant(500.0));
     click_on(kPayModeRow, U'▼');
     EXPECT_EQ(focused(), "PayMode");
@@ -262,18 +260,18 @@ TEST_F(SessionTest, EventsPaneAndLeaving) {
     EXPECT_FALSE(session->events_shown());
     // Something typed: leaving asks once, and anything but y keeps the form.
     EXPECT_TRUE(session->changed());
-    EXPECT_EQ(key(mini::kVkEscape), TerminalSession::Outcome::going_on);
+    EXPECT_EQ(key(kVkEscape), TerminalSession::Outcome::going_on);
     EXPECT_EQ(session->status(), "Discard changes? y/n");
     type(U"n");
     EXPECT_EQ(text("Payee"), Variant("A"));
-    EXPECT_EQ(key('Q', mini::kCtrlMask), TerminalSession::Outcome::going_on);
+    EXPECT_EQ(key('Q', kCtrlMask), TerminalSession::Outcome::going_on);
     EXPECT_EQ(session->handle(Input::char_of(U'y')), TerminalSession::Outcome::quit);
 }
 
 TEST_F(SessionTest, CtrlSAndF10SaveTheRecord) {
     // Without a record file Ctrl+S says how to get one; F10 only finishes.
     type(U"anil");
-    EXPECT_EQ(key('S', mini::kCtrlMask), TerminalSession::Outcome::going_on);
+    EXPECT_EQ(key('S', kCtrlMask), TerminalSession::Outcome::going_on);
     EXPECT_TRUE(session->status().starts_with("No record file"));
 
     std::vector<std::string> writes;
@@ -289,7 +287,7 @@ TEST_F(SessionTest, CtrlSAndF10SaveTheRecord) {
     tab(2);
     type(U"2500");
     // Ctrl+S completes the field (grouped and padded), saves, and comes back to it.
-    EXPECT_EQ(key('S', mini::kCtrlMask), TerminalSession::Outcome::going_on);
+    EXPECT_EQ(key('S', kCtrlMask), TerminalSession::Outcome::going_on);
     EXPECT_EQ(session->status(), "Saved to rec.json");
     EXPECT_EQ(focused(), "Amount");
     ASSERT_EQ(writes.size(), 1u);
@@ -297,14 +295,14 @@ TEST_F(SessionTest, CtrlSAndF10SaveTheRecord) {
     EXPECT_NE(writes[0].find("\"Amount\": 2500,"), std::string::npos) << writes[0];
     EXPECT_NE(writes[0].find("\"Period\": null"), std::string::npos) << writes[0];
     EXPECT_FALSE(session->changed());
-    EXPECT_EQ(key(mini::kVkEscape), TerminalSession::Outcome::quit);  // nothing to lose
+    EXPECT_EQ(key(kVkEscape), TerminalSession::Outcome::quit);  // nothing to lose
 
     // A date whose check fails is not saved; the status line says why.
     tab(1);
     type(U"31/02/2026");
     session->set_record_file("rec.json", [&](const std::string&, const std::string& json) { writes.push_back(json); });
     form.find("VoucherDate")->dispatch().set("TriggerError", Variant(true));
-    EXPECT_EQ(key('S', mini::kCtrlMask), TerminalSession::Outcome::going_on);
+    EXPECT_EQ(key('S', kCtrlMask), TerminalSession::Outcome::going_on);
     EXPECT_TRUE(session->status().ends_with("not saved")) << session->status();
     EXPECT_EQ(writes.size(), 1u);
     EXPECT_EQ(focused(), "VoucherDate");
@@ -312,13 +310,13 @@ TEST_F(SessionTest, CtrlSAndF10SaveTheRecord) {
 
 TEST_F(SessionTest, EnterMovesOnAfterTheControlHadIt) {
     type(U"anil");
-    key(mini::kVkEnter);
+    key(kVkEnter);
     EXPECT_EQ(focused(), "PAN");
     EXPECT_TRUE(logged("event Payee.KeyPress KeyAscii=13"));
     tab(5);
     ASSERT_EQ(focused(), "Period");
     type(U"0626");
-    key(mini::kVkEnter);
+    key(kVkEnter);
     EXPECT_EQ(focused(), "Payee");  // from the last field round to the first
 }
 
@@ -352,7 +350,7 @@ TEST(SessionForms, LockedFieldsAreGreyAndTakeNoFocusOrClicks) {
     EXPECT_EQ(c.at(4, 9).style.fg, kGreyText);
     EXPECT_FALSE(c.at(2, 9).style.dim);
     session.handle(Input::click_at(4, 10));
-    session.handle(Input::key_of(mini::kVkTab));
+    session.handle(Input::key_of(kVkTab));
     EXPECT_EQ(form.focused()->name(), "A");
     session.handle(Input::char_of(U'z'));
     EXPECT_EQ(form.find("B")->dispatch().get("Text"), Variant("kept"));
@@ -363,7 +361,7 @@ TEST(SessionForms, AnEmptyFormStillRunsAndFinishes) {
     const SavedForm saved = parse_form("form \"Nothing\"\n", "e.kform", catalogue.classes());
     mini::Form form;
     TerminalSession session(form, saved, make_date(2026, 1, 1).value());
-    for (int16_t k : {int16_t{mini::kVkTab}, int16_t{mini::kVkDown}, kF4, int16_t{mini::kVkInsert}})
+    for (int16_t k : {int16_t{kVkTab}, int16_t{kVkDown}, kF4, int16_t{kVkInsert}})
         EXPECT_EQ(session.handle(Input::key_of(k)), TerminalSession::Outcome::going_on);
     session.handle(Input::char_of(U'x'));
     session.handle(Input::click_at(3, 3));

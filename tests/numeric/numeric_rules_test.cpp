@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <random>
+#include <stdexcept>
 #include <string>
 #include <vector>
 
@@ -41,7 +42,6 @@ struct Box {
                 case EditStep::Kind::max_length: limit = s.value; break;
                 case EditStep::Kind::send_keys: keys.append(s.keys); break;
                 case EditStep::Kind::control_error: ++errors; break;
-                case EditStep::Kind::save_old_text: break;
             }
         }
     }
@@ -363,6 +363,40 @@ TEST(NumericKeys, RandomTypingKeepsOneNumber) {
     }
 }
 
+TEST(NumericDecision, EveryDecisionFitsItsStepsAndOneMoreFailsLoudly) {
+    // Every key, pressed and put down, over boxes that make the rules write the most: none
+    // may need more steps than a decision holds (a push beyond them throws).
+    std::size_t most = 0;
+    const char* const texts[] = {"", "0", ".", "0.", "12", "1234", "1234.5", "12.50", "45", "12,34,567.50"};
+    for (const char* text : texts)
+        for (int caret : {0, 2, 99})
+            for (int sel : {0, 1})
+                for (int decimals : {0, 1, 2})
+                    for (bool overwrite : {false, true})
+                        for (double max_value : {0.0, 45.5}) {
+                            Box b{text, std::min<int>(caret, static_cast<int>(std::string(text).size())), 0, 7, {}, 0};
+                            b.sel = std::min<int>(sel, static_cast<int>(b.text.size()) - b.caret);
+                            NumericEdit e = edit_of(b, with(kDec2, [&](Settings& s) {
+                                                        s.decimals = decimals;
+                                                        s.limit = decimals == 1 ? 4 : 7;
+                                                        s.overwrite = overwrite;
+                                                        s.max_value = max_value;
+                                                    }));
+                            e.limit = decimals == 1 ? 4 : 7;
+                            e.txt_format = true;
+                            most = std::max(most, format_on_exit(e).steps().size());
+                            for (int key = 0; key <= 255; ++key) {
+                                const auto k = static_cast<int16_t>(key);
+                                most = std::max(most, numeric_key_press(e, k, false).steps().size());
+                                most = std::max(most, numeric_key_down(e, k, 0).steps().size());
+                            }
+                        }
+    EXPECT_LE(most, EditSteps::kCapacity);
+    NumericDecision d;
+    for (std::size_t i = 0; i < EditSteps::kCapacity; ++i) d.push(EditStep{});
+    EXPECT_THROW(d.push(EditStep{}), std::logic_error);
+}
+
 TEST(FormatOnExit, NormalizesGroupsClampsPads) {
     struct Case {
         std::string text;
@@ -379,6 +413,10 @@ TEST(FormatOnExit, NormalizesGroupsClampsPads) {
         {"12.", 2, false, 0, 0, "12.00", 7},
         {"123", 2, true, 0, 0, "123.00", 3},
         {"123456", 2, true, 5000, 0, "5000.00", 8},  // clamped after grouping: ungrouped
+        // Exactly on a bound is inside the range: the grouping stays.
+        {"5000", 2, true, 5000, 0, "5,000.00", 5},
+        {"1000", 0, true, 0, 1000, "1,000", 5},
+        {"999", 0, true, 0, 1000, "1000", 3},
         {"", 2, false, 0, 10, "0.00", 7},  // empty is never clamped
         {".", 2, false, 0, 0, ".00", 7},
         {"99", 0, false, 0, 0, "99", 7},
@@ -414,6 +452,7 @@ TEST(SpinButtons, StepAndClamp) {
     const std::vector<Case> cases = {
         {"5", 0, 0, 0, "5", "5"},
         {"12", 12, 0, 5, "12", "7"},
+        {"3", 10, 3, 1, "4", "3"},  // on MinValue: down stays
         {"abc", 10, 3, 1, "3", "3"},
         {"12,34,567", 0, 0, 1, "1234568", "1234566"},
         {"1", 0, 2, 1, "2", "2"},
