@@ -51,4 +51,11 @@ private:
     }
 };
 
+// Writes the list string's separators as [200] and [201] in the tests' strings.
+inline std::string L(std::string s) {
+    for (auto [mark, code] : {std::pair{"[200]", '\xC8'}, std::pair{"[201]", '\xC9'}})
+        for (std::size_t p = s.find(mark); p != std::string::npos; p = s.find(mark, p + 1)) s.replace(p, 5, 1, code);
+    return s;
+}
+
 }  // namespace kel::test

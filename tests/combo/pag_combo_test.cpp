@@ -9,6 +9,8 @@
 
 #include "keltext/combo/class_info.h"
 #include "keltext/minihost/form.h"
+#include "tests/combo/fake_list.h"
+#include "tests/support/form_recorder.h"
 
 namespace kel {
 namespace {
@@ -17,18 +19,7 @@ using mini::Form;
 using mini::HostedControl;
 using Entries = std::vector<std::pair<std::string, int32_t>>;
 
-std::string L(std::string s) {
-    for (auto [mark, code] : {std::pair{"[200]", '\xC8'}, std::pair{"[201]", '\xC9'}})
-        for (std::size_t p = s.find(mark); p != std::string::npos; p = s.find(mark, p + 1)) s.replace(p, 5, 1, code);
-    return s;
-}
-
-struct Errors : mini::FormObserver {
-    std::vector<std::string> seen;
-    void handler_error(std::string_view where, int number) override {
-        seen.push_back(std::string(where) + " " + std::to_string(number));
-    }
-};
+using test::L;
 
 class PageTest : public ::testing::Test {
 protected:
@@ -58,7 +49,7 @@ protected:
     }
     int32_t selected(HostedControl& pg) { return *peek(pg, "lstList", "ListIndex").get_if<int32_t>(); }
 
-    Errors errors;
+    testing_support::FormRecorder errors;
     Form form;
     ClassInfo combo_class, page_class;
     int pages = 0;
@@ -66,15 +57,6 @@ protected:
 
 // The golden script page_combo.kfs walks Add, Modify, Remove and Apply with their captions and
 // values; these cases cover what it leaves out.
-
-TEST_F(PageTest, PartsInTheirOrder) {
-    HostedControl& pg = open({&combo("c", "")});
-    std::vector<std::string> names;
-    for (auto& [name, part] : pg.parts()) names.push_back(name);
-    EXPECT_EQ(names, (std::vector<std::string>{"fraList", "lblList", "txtList", "lblItemData", "txtItemData",
-                                               "lstList", "cmdAdd", "cmdModify", "cmdRemove", "lblMaxLength",
-                                               "txtMaxLength", "chkLocked"}));
-}
 
 TEST_F(PageTest, AddWithDataThatIsNoNumberStoresZero) {
     HostedControl& pg = open({&combo("c", "A[201]1[200]")});
@@ -90,7 +72,7 @@ TEST_F(PageTest, AddToAFullListIsRefused) {
     HostedControl& pg = open({&combo("c", whole)});
     type_into(pg, "txtList", "D");
     click(pg, "cmdAdd");
-    EXPECT_EQ(errors.seen, (std::vector<std::string>{"pg0.cmdAdd.Click 5"}));
+    EXPECT_EQ(errors.errors, (std::vector<std::string>{"pg0.cmdAdd.Click 5"}));
     EXPECT_EQ(*peek(pg, "lstList", "ListCount").get_if<int32_t>(), 32767);
 }
 
@@ -100,7 +82,7 @@ TEST_F(PageTest, ModifyWithNothingSelectedDoesNothing) {
     type_into(pg, "txtList", "X");
     click(pg, "cmdModify");
     EXPECT_EQ(entries(pg), (Entries{{"A", 1}, {"B", 2}}));
-    EXPECT_TRUE(errors.seen.empty());
+    EXPECT_TRUE(errors.errors.empty());
 }
 
 TEST_F(PageTest, RemoveDownToAnEmptyList) {
@@ -113,7 +95,7 @@ TEST_F(PageTest, RemoveDownToAnEmptyList) {
     click(pg, "cmdRemove");
     EXPECT_TRUE(entries(pg).empty());
     click(pg, "cmdRemove");  // an empty list stays empty
-    EXPECT_TRUE(errors.seen.empty());
+    EXPECT_TRUE(errors.errors.empty());
 }
 
 }  // namespace

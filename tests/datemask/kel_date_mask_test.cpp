@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <functional>
 #include <optional>
 #include <string>
@@ -10,31 +11,12 @@
 #include "keltext/datemask/class_info.h"
 #include "keltext/minihost/form.h"
 #include "keltext/minihost/keyboard.h"
+#include "tests/support/form_recorder.h"
 
 namespace kel {
 namespace {
 
-// Records what the form hears and runs the test's own form code.
-struct Recorder : mini::FormObserver {
-    std::vector<std::string> log;
-    std::function<void(std::string_view, std::span<EventArg>)> on_event;
-
-    void event_raised(mini::HostedControl&, int, std::string_view event, std::span<EventArg> args) override {
-        log.push_back("event " + std::string(event));
-        if (on_event) on_event(event, args);
-    }
-    void keys_sent(mini::HostedControl&, std::string_view keys) override {
-        log.push_back("sendkeys " + std::string(keys));
-    }
-    void property_changed(mini::HostedControl&, std::string_view p) override {
-        log.push_back("changed " + std::string(p));
-    }
-    int count(std::string_view line) const {
-        int n = 0;
-        for (const auto& l : log) n += l == line;
-        return n;
-    }
-};
+using Recorder = testing_support::FormRecorder;
 
 class DateMaskTest : public ::testing::Test {
 protected:
@@ -109,7 +91,7 @@ TEST_F(DateMaskTest, ExitOutcomes) {
         const std::string what = std::string(c.typed) + " Z=" + std::to_string(c.zub) + " T=" +
                                  std::to_string(c.trigger) + " B=" + std::to_string(c.blank);
         EXPECT_EQ(h.part("MskDate")->peek("Text").str(), c.field) << what;
-        EXPECT_EQ(r.count("event DateError"), c.date_error ? 1 : 0) << what;
+        EXPECT_EQ(r.count("DateError"), c.date_error ? 1 : 0) << what;
         EXPECT_EQ(d.AllowLostFocus(), c.allow_lost_focus) << what;
         if (c.date_error) {
             EXPECT_EQ(alf_in_handler, std::optional<bool>(false)) << what;  // false before the event
@@ -141,7 +123,7 @@ TEST_F(DateMaskTest, MonthYearExit) {
         const std::string before = h.part("MskDate")->peek("Text").str();
         f.focus(nullptr);
         EXPECT_EQ(h.part("MskDate")->peek("Text").str(), before) << c.typed;  // never corrected
-        EXPECT_EQ(r.count("event DateError"), c.date_error ? 1 : 0) << c.typed;
+        EXPECT_EQ(r.count("DateError"), c.date_error ? 1 : 0) << c.typed;
         EXPECT_EQ(box(h).AllowLostFocus(), c.allow_lost_focus) << c.typed;
     }
 }
@@ -152,14 +134,14 @@ TEST_F(DateMaskTest, TabbingThroughChecksOnce) {
     d.TriggerError(true);
     form.focus(&h);
     form.focus(nullptr);
-    EXPECT_EQ(rec.count("event DateError"), 1);  // field lost focus and ExitFocus: one check
+    EXPECT_EQ(rec.count("DateError"), 1);  // field lost focus and ExitFocus: one check
     form.focus(&h);
     EXPECT_TRUE(d.AllowLostFocus());
     form.focus(nullptr);
-    EXPECT_EQ(rec.count("event DateError"), 1);
+    EXPECT_EQ(rec.count("DateError"), 1);
     EXPECT_TRUE(d.AllowLostFocus());
     (void)d.Text();
-    EXPECT_EQ(rec.count("event DateError"), 1);
+    EXPECT_EQ(rec.count("DateError"), 1);
 }
 
 // ---- Text -----------------------------------------------------------------------------------
@@ -168,7 +150,7 @@ TEST_F(DateMaskTest, FirstReadOfANewBlankBoxChecksIt) {
     auto& h = add();
     box(h).TriggerError(true);
     EXPECT_EQ(box(h).Text(), Variant());
-    EXPECT_EQ(rec.count("event DateError"), 1);
+    EXPECT_EQ(rec.count("DateError"), 1);
     EXPECT_FALSE(box(h).AllowLostFocus());
     EXPECT_TRUE(box(h).Validated());
 
@@ -195,19 +177,19 @@ TEST_F(DateMaskTest, TextSetter) {
         EXPECT_EQ(field(h), c.field);
         EXPECT_EQ(peek(h, "MskDate", "Mask"), Variant("##/##/####"));
     }
-    EXPECT_EQ(rec.count("changed Text"), 4);
-    EXPECT_EQ(rec.count("event DateError"), 0);
+    EXPECT_EQ(std::count(rec.changed.begin(), rec.changed.end(), "Text"), 4);
+    EXPECT_EQ(rec.count("DateError"), 0);
 
     d.Text(Variant("31/01/2003"));
     d.Text(Variant("31/04/2003"));
     d.Text(Variant(int16_t{5}));
     EXPECT_EQ(field(h), "31/01/2003");
-    EXPECT_EQ(rec.count("event DateError"), 0);
+    EXPECT_EQ(rec.count("DateError"), 0);
     d.TriggerError(true);
     d.Text(Variant("not a date"));
     EXPECT_EQ(field(h), "31/01/2003");
-    EXPECT_EQ(rec.count("event DateError"), 1);
-    EXPECT_EQ(rec.count("changed Text"), 8);
+    EXPECT_EQ(rec.count("DateError"), 1);
+    EXPECT_EQ(std::count(rec.changed.begin(), rec.changed.end(), "Text"), 8);
 }
 
 // ---- Properties ------------------------------------------------------------------------------
@@ -217,14 +199,14 @@ TEST_F(DateMaskTest, ChangeOnlyWhileEnabledAndNotLocked) {
     auto& h = add();
     auto& d = box(h);
     d.Text(Variant("01/01/2003"));
-    EXPECT_GE(rec.count("event Change"), 1);
-    rec.log.clear();
+    EXPECT_GE(rec.count("Change"), 1);
+    rec.events.clear();
     d.Locked(true);
     d.Text(Variant("02/01/2003"));
     d.Locked(false);
     d.Enabled(false);
     d.Text(Variant("03/01/2003"));
-    EXPECT_EQ(rec.count("event Change"), 0);
+    EXPECT_EQ(rec.count("Change"), 0);
 }
 
 }  // namespace

@@ -52,10 +52,6 @@ TEST(ScriptPlayer, Scripts) {
          "new TestBox b\nfocus b\nkey Shift+a\n",
          "event b.KeyDown KeyCode=65 Shift=1\nevent b.KeyPress KeyAscii=65\nevent b.Change\n"
          "event b.KeyUp KeyCode=65 Shift=1\n"},
-        {"handlers change by-reference arguments, in the order added",
-         "new TestBox b\nfocus b\non b.KeyPress set KeyAscii 0\non b.KeyPress echo \"dropped\"\n"
-         "on b.keypress get b.Text\ntrace events off\ntype \"x\"\noff b.KeyPress\ntype \"y\"\nget b.Text\n",
-         "dropped\nb.Text = str \"\"\nb.Text = str \"y\"\n"},
         {"a handler's run-time error is printed",
          "new TestBox b\non b.Change set b.Number -5\ntrace events off\nset b.Text \"a\"\n",
          "b.Number -> error 380\n"},

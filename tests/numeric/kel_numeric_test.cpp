@@ -9,23 +9,14 @@
 
 #include "keltext/minihost/form.h"
 #include "keltext/numeric/class_info.h"
+#include "tests/support/form_recorder.h"
 
 namespace kel {
 namespace {
 
 using mini::HostedControl;
 
-struct Recorder : mini::FormObserver {
-    std::vector<std::string> events;
-    void event_raised(HostedControl&, int, std::string_view event, std::span<EventArg>) override {
-        events.emplace_back(event);
-    }
-    int count(std::string_view event) const {
-        int n = 0;
-        for (const auto& e : events) n += e.find(event) != std::string::npos;
-        return n;
-    }
-};
+using Recorder = testing_support::FormRecorder;
 
 class NumericTest : public ::testing::Test {
 protected:
@@ -88,11 +79,11 @@ TEST_F(NumericTest, ClicksReachTheFormOnlyWhenEnabledAndNotLocked) {
     mini::Part& box = *n.part("txtNumeric");
     form.click(n, box);
     form.dbl_click(n, box);
-    EXPECT_EQ(rec.count("Click"), 2);
+    EXPECT_EQ(rec.count("Click") + rec.count("DblClick"), 2);
     set(n, "Locked", Variant(true));
     poke(n, "surface", "Enabled", Variant(true));  // reach the handler despite the lock
     form.click(n, box);
-    EXPECT_EQ(rec.count("Click"), 2);
+    EXPECT_EQ(rec.count("Click"), 1);
 }
 
 // ---- persistence ---------------------------------------------------------------------------------

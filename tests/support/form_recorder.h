@@ -28,6 +28,15 @@ struct FormRecorder : mini::FormObserver {
     void handler_error(std::string_view where, int number) override {
         errors.push_back(std::string(where) + " " + std::to_string(number));
     }
+    // How many times the event named exactly `event` was raised.
+    int count(std::string_view event) const {
+        int n = 0;
+        for (const auto& e : events) {
+            const std::size_t from = e.find(' ') + 1;
+            n += std::string_view(e).substr(from, e.find(' ', from) - from) == event;
+        }
+        return n;
+    }
     bool saw(std::string_view event) const {
         for (const auto& e : events)
             if (e.find(event) != std::string::npos) return true;
