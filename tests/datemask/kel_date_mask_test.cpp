@@ -100,33 +100,8 @@ TEST_F(DateMaskTest, ExitOutcomes) {
     }
 }
 
-TEST_F(DateMaskTest, MonthYearExit) {
-    struct Case {
-        const char* typed;
-        bool trigger;
-        bool date_error;
-        bool allow_lost_focus;
-    };
-    const Case cases[] = {
-        {"0503", false, false, true}, {"0503", true, false, true}, {"1303", false, false, false},
-        {"1303", true, true, false},  {"050", true, true, false},   {"", true, true, false},
-    };
-    for (const auto& c : cases) {
-        mini::Form f;
-        Recorder r;
-        f.set_observer(&r);
-        auto& h = f.create(cls, "d");
-        box(h).DateStyle(mmyyA);
-        box(h).TriggerError(c.trigger);
-        f.focus(&h);
-        for (char ch : std::string_view(c.typed)) f.keystroke(mini::keystroke_for_char(static_cast<uint8_t>(ch)));
-        const std::string before = h.part("MskDate")->peek("Text").str();
-        f.focus(nullptr);
-        EXPECT_EQ(h.part("MskDate")->peek("Text").str(), before) << c.typed;  // never corrected
-        EXPECT_EQ(r.count("DateError"), c.date_error ? 1 : 0) << c.typed;
-        EXPECT_EQ(box(h).AllowLostFocus(), c.allow_lost_focus) << c.typed;
-    }
-}
+// date_monthyear.kfs walks the month-year style through its exits, with and without
+// TriggerError.
 
 TEST_F(DateMaskTest, TabbingThroughChecksOnce) {
     auto& h = add();
