@@ -182,35 +182,8 @@ TEST_F(ComboTest, DownInAnEmptyListIsConsumed) {
     EXPECT_EQ(get(c, "ListIndex"), Variant(int16_t{-1}));
 }
 
-// ---- the character filter ---------------------------------------------------------------------
-
-TEST_F(ComboTest, MaxLengthRefusesKeysWithoutKeyPress) {
-    HostedControl& c = focused({});
-    set(c, "AutoSearch", Variant(false));
-    set(c, "TextType", Variant(int32_t{KelCboUserKeys}));
-    set(c, "MaxLength", Variant(int16_t{3}));
-    type("abcd");
-    EXPECT_EQ(text(c), "abc");
-    rec.events.clear();
-    type("e");
-    for (const auto& e : rec.events) EXPECT_EQ(e.find("KeyPress"), std::string::npos) << e;
-    key("Backspace");
-    EXPECT_EQ(text(c), "ab");
-    form.select(c, 0, 2);
-    type("z");
-    EXPECT_EQ(text(c), "z");
-    form.paste("123456");
-    EXPECT_EQ(text(c), "z12");
-}
-
-TEST_F(ComboTest, AKeyTheFormDropsStaysDropped) {
-    HostedControl& c = focused({});
-    rec.on_event = [](std::string_view e, std::span<EventArg> args) {
-        if (e == "KeyPress") args[0].value = Variant(int16_t{0});
-    };
-    type("ab");
-    EXPECT_EQ(text(c), "");
-}
+// combo_filter.kfs covers the character filter: MaxLength refusing keys before KeyPress, a
+// selection typed over, a paste cut to the limit and a key the form drops.
 
 // ---- properties and methods -------------------------------------------------------------------
 
