@@ -84,30 +84,8 @@ TEST_F(AlphaTest, TypingFiltersAndShapes) {
     }
 }
 
-TEST_F(AlphaTest, OverwriteModeReplacesTheCharacterAfterTheCaret) {
-    struct Case {
-        int32_t type;
-        const char* start;
-        int32_t caret;
-        const char* typed;
-        const char* expected;
-    } cases[] = {
-        {KelANUpperCase, "abc", 1, "x", "aXc"}, {KelANUAlphaNumeric, "ABC", 0, "zz", "ZZC"},
-        {KelANDigits, "123", 1, "x", "123"},    {KelANSentence, "abc", 0, "q", "Qbc"},
-        {KelANCommStyle, "a-b", 1, "_", "a_b"},
-    };
-    form.set_insert(true);
-    int n = 0;
-    for (const Case& c : cases) {
-        HostedControl& a = add("o" + std::to_string(n++));
-        set(a, "TextType", Variant(c.type));
-        set(a, "Text", Variant(c.start));
-        form.focus(&a);
-        form.select(a, c.caret, 0);
-        type(c.typed);
-        EXPECT_EQ(text(a), c.expected) << c.start << " typing " << c.typed;
-    }
-}
+// Overwrite mode: alpha_typing.kfs types over a digits box; the rule for every type is
+// OverwriteEmulation in alpha_rules_test.cpp.
 
 // ---- caret after a change ---------------------------------------------------------------------------
 
