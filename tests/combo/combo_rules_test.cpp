@@ -43,6 +43,8 @@ INSTANTIATE_TEST_SUITE_P(
                     SearchCase{"SortedFindsLast", kFruit, true, "c", 2, 3},
                     SearchCase{"SortedRunsToTheEnd", kFruit, true, "z", -1, 3},
                     SearchCase{"SortedTwoLetters", kFruit, true, "ap", 0, 1},
+                    // An entry shorter than the text sorts before it: the search goes on.
+                    SearchCase{"SortedShortEntryBeforeTheText", {"Ca", "Cash", "Cheque"}, true, "cas", 1, 2},
                     SearchCase{"SortedStopsEarly", {"Apple", "Banana", "Cherry", "Date"}, true, "bz", -1, 3},
                     SearchCase{"UnsortedNoMatch", kFruit, false, "x", -1, 3},
                     SearchCase{"LowerIndexWins", {"Bean", "Banana", "Bar"}, false, "ba", 1, 2},
