@@ -1,0 +1,2 @@
+#pragma once
+#include "keltext/qt/control_widget.h"
