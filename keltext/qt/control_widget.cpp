@@ -8,6 +8,8 @@
 #include "keltext/host/charset.h"
 #include "keltext/host/errors.h"
 #include "keltext/qt/property_bag.h"
+#include "keltext/host/conversions.h"
+#include "keltext/qt/qt_keys.h"
 #include "keltext/qt/qt_values.h"
 #include "keltext/qt/services.h"
 
@@ -72,6 +74,77 @@ QVariant ControlWidget::invoke(const QString& method, const QVariantList& args) 
     for (const QVariant& a : args) values.push_back(variant_of(a));
     return qvariant_of(dispatch().call(method.toStdString(), std::span<const Variant>(values)));
 }
+
+Variant ControlWidget::getMember(std::string_view name, const Variant* index) { return dispatch().get(name, index); }
+
+void ControlWidget::putMember(std::string_view name, const Variant& value, const Variant* index) {
+    struct After {
+        ControlWidget& w;
+        ~After() { w.after_call(); }
+    } after{*this};
+    dispatch().set(name, value, index);
+}
+
+void ControlWidget::callMember(std::string_view name, std::vector<Variant> args) {
+    struct After {
+        ControlWidget& w;
+        ~After() { w.after_call(); }
+    } after{*this};
+    dispatch().call(name, std::span<const Variant>(args));
+}
+
+const ClassInfo* ControlWidget::catalogueClass(const char* name) {
+    const ClassInfo* cls = Services::of_application().catalogue().find(name);
+    if (!cls) throw model::FormError(std::string("no class ") + name);
+    return cls;
+}
+
+namespace {
+
+// An argument the form's code left in a kind that does not convert reads as the control gave it.
+template <class F>
+auto arg_or(std::span<EventArg> args, std::size_t i, F&& f) -> decltype(f(Variant())) {
+    if (i >= args.size()) return {};
+    try {
+        return f(args[i].value);
+    } catch (const RuntimeError&) {
+        return {};
+    }
+}
+
+}  // namespace
+
+template <>
+short ControlWidget::argValue<short>(std::span<EventArg> args, std::size_t i) {
+    return arg_or(args, i, [](const Variant& v) { return static_cast<short>(to_int16(v)); });
+}
+template <>
+int ControlWidget::argValue<int>(std::span<EventArg> args, std::size_t i) {
+    return arg_or(args, i, [](const Variant& v) { return static_cast<int>(to_int32(v)); });
+}
+template <>
+float ControlWidget::argValue<float>(std::span<EventArg> args, std::size_t i) {
+    return arg_or(args, i, [](const Variant& v) { return to_single(v); });
+}
+template <>
+double ControlWidget::argValue<double>(std::span<EventArg> args, std::size_t i) {
+    return arg_or(args, i, [](const Variant& v) { return to_double(v); });
+}
+template <>
+bool ControlWidget::argValue<bool>(std::span<EventArg> args, std::size_t i) {
+    return arg_or(args, i, [](const Variant& v) { return to_bool(v); });
+}
+template <>
+QString ControlWidget::argValue<QString>(std::span<EventArg> args, std::size_t i) {
+    return arg_or(args, i, [](const Variant& v) { return qstring_of(text_of(v)); });
+}
+template <>
+QVariant ControlWidget::argValue<QVariant>(std::span<EventArg> args, std::size_t i) {
+    return arg_or(args, i, [](const Variant& v) { return qvariant_of(v); });
+}
+
+Variant ControlWidget::argVariant(const QString& v) { return Variant(from_utf8(v.toStdString())); }
+Variant ControlWidget::argVariant(const QVariant& v) { return variant_of(v); }
 
 model::StoredValues ControlWidget::save() {
     StoredBag bag;

@@ -23,6 +23,7 @@
 #include <memory>
 #include <optional>
 #include <string>
+#include <vector>
 
 #include "keltext/host/members.h"
 #include "keltext/qt/site.h"
@@ -98,6 +99,26 @@ protected:
         }
         return decltype(f())();
     }
+    // Members through the member table, the views synced after a write or call.
+    Variant getMember(std::string_view name, const Variant* index = nullptr);
+    void putMember(std::string_view name, const Variant& value, const Variant* index = nullptr);
+    void callMember(std::string_view name, std::vector<Variant> args);
+    // The application's class of that name (FormError when the catalogue lacks it).
+    static const ClassInfo* catalogueClass(const char* name);
+    // Event arguments as the typed signals take them, and back when a slot changed one.
+    template <class T>
+    static T argValue(std::span<EventArg> args, std::size_t i);
+    template <class T>
+    static void putArg(std::span<EventArg> args, std::size_t i, const T& value) {
+        if (i < args.size() && !(argValue<T>(args, i) == value)) args[i].value = argVariant(value);
+    }
+    static Variant argVariant(short v) { return Variant(static_cast<int16_t>(v)); }
+    static Variant argVariant(int v) { return Variant(static_cast<int32_t>(v)); }
+    static Variant argVariant(float v) { return Variant(v); }
+    static Variant argVariant(double v) { return Variant(v); }
+    static Variant argVariant(bool v) { return Variant(v); }
+    static Variant argVariant(const QString& v);
+    static Variant argVariant(const QVariant& v);
     void report(const RuntimeError& e);
     void report_text(const char* message);
     // After a call through the member table: views show the models, queued keys go.
@@ -121,6 +142,21 @@ private:
     QSize applied_;
     int last_error_ = 0;
 };
+
+template <>
+short ControlWidget::argValue<short>(std::span<EventArg> args, std::size_t i);
+template <>
+int ControlWidget::argValue<int>(std::span<EventArg> args, std::size_t i);
+template <>
+float ControlWidget::argValue<float>(std::span<EventArg> args, std::size_t i);
+template <>
+double ControlWidget::argValue<double>(std::span<EventArg> args, std::size_t i);
+template <>
+bool ControlWidget::argValue<bool>(std::span<EventArg> args, std::size_t i);
+template <>
+QString ControlWidget::argValue<QString>(std::span<EventArg> args, std::size_t i);
+template <>
+QVariant ControlWidget::argValue<QVariant>(std::span<EventArg> args, std::size_t i);
 
 // The control of class `creation.cls` as its wrapper class when it has one (KelNumeric, ...),
 // else as a plain ControlWidget.
