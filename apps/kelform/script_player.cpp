@@ -119,8 +119,10 @@ struct Player::Handler {
     std::string text;      // echo
 };
 
-Player::Player(std::span<const ClassInfo> classes, std::ostream& out)
-    : classes_(classes), out_(out), form_(std::make_unique<mini::Form>(static_cast<mini::FormObserver*>(this))) {
+Player::Player(std::span<const ClassInfo> classes, std::ostream& out, const FormMaker& make_form)
+    : classes_(classes), out_(out) {
+    auto* observer = static_cast<model::FormObserver*>(this);
+    form_ = make_form ? make_form(observer) : std::make_unique<mini::Form>(observer);
     add_builtin_commands();
 }
 

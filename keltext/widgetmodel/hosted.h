@@ -82,10 +82,11 @@ public:
 
     // `new`: Initialize, InitProperties, then one Resize. The surface starts at the size
     // given without a Resize. Names must be unique (FormError).
-    virtual HostedControl& create(const ClassInfo& cls, std::string name, float width = 1200, float height = 300) = 0;
+    virtual HostedControl& create(const ClassInfo& cls, std::string name, float width = 1200,
+                                  float height = 300) = 0;
     // `load`: Initialize, ReadProperties from a store holding exactly `store`, then Resize.
-    virtual HostedControl& load(const ClassInfo& cls, std::string name, const StoredValues& store, float width = 1200,
-                                float height = 300) = 0;
+    virtual HostedControl& load(const ClassInfo& cls, std::string name, const StoredValues& store,
+                                float width = 1200, float height = 300) = 0;
     // WriteProperties into an empty store; the values stored, in order.
     virtual StoredValues save(HostedControl& control) = 0;
 
@@ -96,7 +97,8 @@ public:
     virtual std::vector<HostedControl*> controls() = 0;
 
     // Opens a property page on the selected controls (item 0 first) and runs SelectionChanged.
-    virtual HostedControl& open_page(const ClassInfo& page_class, std::string name, std::vector<HostedControl*> selected) = 0;
+    virtual HostedControl& open_page(const ClassInfo& page_class, std::string name,
+                                     std::vector<HostedControl*> selected) = 0;
     virtual void apply_page(HostedControl& page) = 0;  // ApplyChanges
 
     // Focus. focus(nullptr) moves focus off every control.
@@ -128,7 +130,8 @@ public:
     virtual void click(HostedControl& control, Part& part) = 0;
     virtual void dbl_click(HostedControl& control, Part& part) = 0;
     virtual void notify(HostedControl& control, Part& part, std::string_view notification) = 0;
-    virtual void mouse(HostedControl& control, Part& part, bool down, int16_t button, int16_t shift, float x, float y) = 0;
+    virtual void mouse(HostedControl& control, Part& part, bool down, int16_t button, int16_t shift, float x,
+                       float y) = 0;
 
     // The form resizes a control's surface (Resize when the size changes).
     virtual void resize(HostedControl& control, float width, float height) = 0;
