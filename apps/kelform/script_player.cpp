@@ -144,7 +144,7 @@ void Player::add_builtin_commands() {
         {"insert", &Player::cmd_insert},   {"paste", &Player::cmd_paste},     {"select", &Player::cmd_select},
         {"notify", &Player::cmd_notify},   {"on", &Player::cmd_on},           {"off", &Player::cmd_off},
         {"trace", &Player::cmd_trace},     {"echo", &Player::cmd_echo},       {"expect", &Player::cmd_expect},
-        {"page", &Player::cmd_page},       {"apply", &Player::cmd_apply},
+        {"page", &Player::cmd_page},       {"apply", &Player::cmd_apply},     {"clipboard", &Player::cmd_clipboard},
     };
     for (const auto& entry : simple) {
         M fn = entry.second;
@@ -533,6 +533,16 @@ void Player::cmd_paste(Args& a) {
     a.finish();
     mini::HostedControl& c = focused_for_input();
     guarded(c.name(), [&] { form_->paste(text); });
+}
+
+void Player::cmd_clipboard(Args& a) {
+    if (a.done()) {
+        out_ << "clipboard = " << format_value(Variant(form_->clipboard())) << '\n';
+        return;
+    }
+    std::string text = a.text("text");
+    a.finish();
+    form_->set_clipboard(text);
 }
 
 void Player::cmd_select(Args& a) {

@@ -108,6 +108,7 @@ private:
     void cmd_keypress(Args& a);
     void cmd_insert(Args& a);
     void cmd_paste(Args& a);
+    void cmd_clipboard(Args& a);
     void cmd_select(Args& a);
     void cmd_click(Args& a, bool dbl);
     void cmd_notify(Args& a);

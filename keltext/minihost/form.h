@@ -68,6 +68,8 @@ public:
     void select(HostedControl& control, int32_t start, int32_t length) override;
     void set_insert(bool on) override;
     bool insert_on() const override;
+    void set_clipboard(std::string_view text) override;
+    std::string clipboard() const override;
     void click(HostedControl& control, Part& part) override;
     void dbl_click(HostedControl& control, Part& part) override;
     void notify(HostedControl& control, Part& part, std::string_view notification) override;

@@ -125,6 +125,10 @@ public:
     virtual void set_insert(bool on) = 0;
     virtual bool insert_on() const = 0;
 
+    // The host's clipboard as the widgets see it (Windows-1252 text).
+    virtual void set_clipboard(std::string_view text) = 0;
+    virtual std::string clipboard() const = 0;
+
     // Clicks and notifications on a part; focus does not move. Not delivered to a disabled
     // surface or widget. FormError for a notification the part does not raise.
     virtual void click(HostedControl& control, Part& part) = 0;
