@@ -156,6 +156,8 @@ void FormWindow::tab(bool forward) {
 
 void FormWindow::set_insert(bool on) { services_.set_insert(on); }
 bool FormWindow::insert_on() const { return services_.insert_on(); }
+void FormWindow::set_clipboard(std::string_view text) { services_.clipboard().set_text(text); }
+std::string FormWindow::clipboard() const { return services_.clipboard().text(); }
 
 void FormWindow::resize(model::HostedControl& control, float width, float height) {
     site_of(control).surface_model().set_size(width, height);

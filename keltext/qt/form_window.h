@@ -66,6 +66,9 @@ public:
 
     void set_insert(bool on);
     bool insert_on() const;
+    // The system clipboard (Windows-1252 text), as the edit fields see it.
+    void set_clipboard(std::string_view text);
+    std::string clipboard() const;
 
     // The surface's new size in twips, with one Resize when it changed; the view follows
     // without a second Resize.

@@ -1,6 +1,8 @@
 #include "keltext/qt/services.h"
 
 #include <QApplication>
+#include <QClipboard>
+#include <QGuiApplication>
 #include <QCoreApplication>
 #include <QFocusEvent>
 #include <QInputMethodEvent>
@@ -80,7 +82,7 @@ void Services::schedule_flush() {
 
 void Services::keystroke_to(QtSite& site, const model::Keystroke& k, bool up) {
     if (!up) {
-        if (toggles_insert(k.key_code, k.shift)) insert_ = !insert_;  // flips as the key goes down
+        if (model::toggles_insert(k.key_code, k.shift)) insert_ = !insert_;  // flips as the key goes down
         if (auto* p = site.input_target()) p->user_key_down(k.key_code, k.shift);
         if (k.char_code)
             if (auto* p = site.input_target()) p->user_key_press(*k.char_code);
@@ -176,9 +178,12 @@ void Services::set_control_focus(QtSite* target) {
     }
 }
 
-bool Services::toggles_insert(int16_t key_code, int16_t shift) {
-    // Shift+Insert pastes and Ctrl+Insert copies: only the plain key toggles overwrite.
-    return key_code == kVkInsert && (shift & (kShiftMask | kCtrlMask)) == 0;
+std::string Services::SystemClipboard::text() const {
+    return from_utf8(QGuiApplication::clipboard()->text().toStdString());
+}
+
+void Services::SystemClipboard::set_text(std::string_view text) {
+    QGuiApplication::clipboard()->setText(qstring_of(std::string(text)));
 }
 
 bool Services::route_shortcut_override(QtSite&, QKeyEvent* e) {

@@ -27,6 +27,7 @@
 #include "keltext/library/catalogue.h"
 #include "keltext/widgetmodel/hosted.h"
 #include "keltext/widgetmodel/keyboard.h"
+#include "keltext/widgetmodel/widget_base.h"
 
 class QEvent;
 class QWidget;
@@ -53,6 +54,10 @@ public:
     // Ambient UserMode of every control: false in a designer.
     void set_user_mode(bool running) { user_mode_ = running; }
     bool user_mode() const { return user_mode_; }
+
+    // The clipboard the edit fields copy to and paste from: the system's (QClipboard), in
+    // Windows-1252 (characters the set lacks are dropped from a paste).
+    model::Clipboard& clipboard() { return clipboard_; }
 
     void set_insert(bool on) { insert_ = on; }
     bool insert_on() const { return insert_; }
@@ -97,9 +102,6 @@ public:
     // A site going away must not stay focused.
     void forget(QtSite& site);
 
-    // Whether a key down flips the Insert toggle.
-    static bool toggles_insert(int16_t key_code, int16_t shift);
-
     static constexpr std::size_t kMaxSentKeys = 10000;
 
 private:
@@ -109,7 +111,13 @@ private:
     void deliver_sent(const model::SentKey& k);
     void schedule_flush();
 
+    struct SystemClipboard final : model::Clipboard {
+        std::string text() const override;
+        void set_text(std::string_view text) override;
+    };
+
     Catalogue catalogue_;
+    SystemClipboard clipboard_;
     model::FormObserver* observer_ = nullptr;
     bool user_mode_ = true;
     bool insert_ = false;

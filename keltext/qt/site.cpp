@@ -102,6 +102,8 @@ void QtSite::raise_event(int number, std::string_view name, std::span<EventArg> 
     }
 }
 
+model::Clipboard* QtSite::clipboard() { return &services_.clipboard(); }
+
 void QtSite::handler_error(std::string_view part, std::string_view notification, int number) {
     if (auto* o = services_.observer()) o->handler_error(handler_where(part, notification), number);
 }

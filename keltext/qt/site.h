@@ -90,6 +90,7 @@ public:
     bool can_take_focus() const override { return surface_.Enabled(); }
 
     // WidgetContext
+    model::Clipboard* clipboard() override;
     void handler_error(std::string_view part, std::string_view notification, int number) override;
     bool enter_handler() override;
     void leave_handler() override;

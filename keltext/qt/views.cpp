@@ -217,7 +217,7 @@ void EditFieldView::show_context_menu(const QPoint& global) {
     if (!chosen) return;
     Services& s = site_.services();
     if (chosen == copy) {
-        QApplication::clipboard()->setText(qstring_of(field_.SelText()));
+        s.clipboard().set_text(field_.SelText());
     } else if (chosen == paste) {
         s.route_paste(site_, QApplication::clipboard()->text());
     } else if (chosen == select_all) {
