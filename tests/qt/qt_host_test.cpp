@@ -38,11 +38,7 @@ struct Recorder : model::FormObserver {
 std::string peek_text(model::HostedControl& c) { return c.keyboard_part()->peek("Text").str(); }
 
 // What the view shows, in the controls' character set.
-std::string shown(QtSite& s) {
-    if (auto* e = qobject_cast<QLineEdit*>(s.focus_view())) return cp1252_of(e->text()).value_or("?");
-    if (auto* c = qobject_cast<QComboBox*>(s.focus_view())) return cp1252_of(c->lineEdit()->text()).value_or("?");
-    return "?";
-}
+std::string shown(QtSite& s) { return s.shown_text(*s.keyboard_part()).value_or("?"); }
 
 // A form with the same controls on both hosts.
 struct Both {
