@@ -223,7 +223,13 @@ void ControlWidget::site_synced() {
         resize(px);
         updateGeometry();
     }
-    update();
+    const model::SurfaceModel& s = site_->surface_model();
+    if (s.BackColor() != shown_back_ || s.ForeColor() != shown_fore_ || s.BorderStyle() != shown_border_) {
+        shown_back_ = s.BackColor();
+        shown_fore_ = s.ForeColor();
+        shown_border_ = s.BorderStyle();
+        update();
+    }
 }
 
 void ControlWidget::resizeEvent(QResizeEvent* e) {

@@ -140,6 +140,9 @@ private:
     std::string name_;
     std::unique_ptr<QtSite> site_;
     QSize applied_;
+    // The surface as last painted: repainted only when it changes.
+    Colour shown_back_ = 0, shown_fore_ = 0;
+    int16_t shown_border_ = -1;
     int last_error_ = 0;
 };
 

@@ -50,19 +50,21 @@ void sync_widget(QWidget& view, const Widget& model, const QtSite& site) {
     if (view.isVisibleTo(view.parentWidget()) != model.Visible()) view.setVisible(model.Visible());
 }
 
-void sync_text_style(QWidget& view, const TextWidget& model) {
-    if (const auto f = model.Font()) {
-        const QFont q = qfont_of(*f);
-        if (view.font() != q) view.setFont(q);
+void sync_text_style(QWidget& view, const TextWidget& model, ShownStyle& shown) {
+    const auto f = model.Font();
+    if (f && (!shown.set || !shown.font.same_as(*f))) {
+        view.setFont(qfont_of(*f));
+        shown.font = *f;
     }
-    const QColor back = qcolor_of(model.BackColor());
-    const QColor fore = qcolor_of(model.ForeColor());
-    QPalette p = view.palette();
-    if (p.color(QPalette::Base) != back || p.color(QPalette::Text) != fore) {
-        p.setColor(QPalette::Base, back);
-        p.setColor(QPalette::Text, fore);
+    if (!shown.set || shown.fore != model.ForeColor() || shown.back != model.BackColor()) {
+        QPalette p = view.palette();
+        p.setColor(QPalette::Base, qcolor_of(model.BackColor()));
+        p.setColor(QPalette::Text, qcolor_of(model.ForeColor()));
         view.setPalette(p);
+        shown.fore = model.ForeColor();
+        shown.back = model.BackColor();
     }
+    shown.set = true;
 }
 
 void deliver_click(QtSite& site, model::InputPart& part) {
@@ -100,7 +102,7 @@ void EditFieldView::sync_text() {
     const int start = field_.SelStart();
     const int length = field_.SelLength();
     if (length > 0) {
-        if (selectionStart() != start || selectedText().size() != length || cursorPosition() != start + length)
+        if (selectionStart() != start || selectionLength() != length || cursorPosition() != start + length)
             setSelection(start, length);
     } else if (hasSelectedText() || cursorPosition() != start) {
         setCursorPosition(start);
@@ -110,7 +112,7 @@ void EditFieldView::sync_text() {
 void EditFieldView::sync() {
     if (!in_combo_) {
         sync_widget(*this, field_, site_);
-        sync_text_style(*this, field_);
+        sync_text_style(*this, field_, style_);
     }
     sync_text();
 }
@@ -243,7 +245,7 @@ ComboView::ComboView(QtSite& site, model::ComboBoxModel& combo, QWidget* parent)
 
 void ComboView::sync() {
     sync_widget(*this, combo_, site_);
-    sync_text_style(*edit_, combo_);
+    sync_text_style(*edit_, combo_, style_);
     edit_->sync_text();
 }
 
