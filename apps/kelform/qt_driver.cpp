@@ -10,6 +10,7 @@
 #include "keltext/qt/qt_keys.h"
 #include "keltext/qt/services.h"
 #include "keltext/qt/views.h"
+#include "keltext/widgetmodel/property_store.h"
 
 namespace kel::kelform {
 namespace {
@@ -32,23 +33,17 @@ std::string quoted(const std::string& s) { return "\"" + s + "\""; }
 
 }  // namespace
 
-QtFormDriver::QtFormDriver(model::FormObserver* observer) : pages_(observer) { window_.set_observer(observer); }
+QtFormDriver::QtFormDriver(model::FormObserver* observer) { window_.set_observer(observer); }
 
 QtFormDriver::~QtFormDriver() {
-    // Pages let go of the window's controls first; no event reaches a player being destroyed.
-    pages_.set_observer(nullptr);
+    // No event reaches a player being destroyed; pages let go of the window's controls first.
     window_.set_observer(nullptr);
+    pages_.clear();
 }
 
-void QtFormDriver::set_observer(model::FormObserver* observer) {
-    window_.set_observer(observer);
-    pages_.set_observer(observer);
-}
+void QtFormDriver::set_observer(model::FormObserver* observer) { window_.set_observer(observer); }
 
-void QtFormDriver::set_user_mode(bool running) {
-    window_.set_user_mode(running);
-    pages_.set_user_mode(running);
-}
+void QtFormDriver::set_user_mode(bool running) { window_.set_user_mode(running); }
 bool QtFormDriver::user_mode() const { return window_.user_mode(); }
 
 void QtFormDriver::check_name_free(const std::string& name) {
@@ -67,30 +62,60 @@ model::HostedControl& QtFormDriver::load(const ClassInfo& cls, std::string name,
 }
 
 model::StoredValues QtFormDriver::save(model::HostedControl& control) {
-    return is_page(control) ? pages_.save(control) : window_.save(control);
+    if (qt::PageWidget* page = page_of(control)) {
+        qt::QtSite& s = page->site();
+        model::PropertyStore bag;
+        s.guarded("surface", "WriteProperties", [&] { s.control().WriteProperties(bag); });
+        run_pending();
+        return bag.values();
+    }
+    return window_.save(control);
 }
 
 model::HostedControl* QtFormDriver::find(std::string_view name) {
     if (model::HostedControl* c = window_.find(name)) return c;
-    return pages_.find(name);
+    for (auto& p : pages_)
+        if (same_name(p->site().name(), name)) return &p->site();
+    return nullptr;
 }
 
 void QtFormDriver::reserve(std::size_t more) { window_.reserve(more); }
 std::vector<model::HostedControl*> QtFormDriver::controls() { return window_.controls(); }
 
-bool QtFormDriver::is_page(model::HostedControl& control) { return window_.find(control.name()) != &control; }
+qt::PageWidget* QtFormDriver::page_of(model::HostedControl& control) {
+    for (auto& p : pages_)
+        if (&p->site() == &control) return p.get();
+    return nullptr;
+}
 
-// Pages have no Qt view yet: they open on a minimal-host form, on the window's controls.
+bool QtFormDriver::is_page(model::HostedControl& control) { return page_of(control) != nullptr; }
+
+qt::QtSite& QtFormDriver::any_site(model::HostedControl& control) {
+    if (qt::PageWidget* page = page_of(control)) return page->site();
+    return window_.site_of(control);
+}
+
+// A page is a window of its own beside the form, shown without taking activation from it
+// (Qt delivers focus only inside the active window).
 model::HostedControl& QtFormDriver::open_page(const ClassInfo& page_class, std::string name,
                                               std::vector<model::HostedControl*> selected) {
+    if (name.empty()) throw model::FormError("a page needs a name");
+    for (char c : name)
+        if (!((c >= 'A' && c <= 'Z') || (c >= 'a' && c <= 'z') || (c >= '0' && c <= '9') || c == '_'))
+            throw model::FormError("bad control name '" + name + "': letters, digits and _ only");
     check_name_free(name);
-    model::HostedControl& page = pages_.open_page(page_class, std::move(name), std::move(selected));
+    auto page = std::make_unique<qt::PageWidget>(page_class, std::move(name), std::move(selected));
+    page->setAttribute(Qt::WA_ShowWithoutActivating);
+    page->show();
+    pages_.push_back(std::move(page));
     window_.sync();
-    return page;
+    return pages_.back()->site();
 }
 
 void QtFormDriver::apply_page(model::HostedControl& page) {
-    pages_.apply_page(page);
+    qt::PageWidget* p = page_of(page);
+    if (!p) throw model::FormError(page.name() + " is not a property page");
+    p->apply();
     window_.sync();  // ApplyChanges wrote to the window's controls through their member tables
 }
 
@@ -203,8 +228,7 @@ bool QtFormDriver::takes_input(qt::QtSite& site, model::InputPart& p) {
 }
 
 void QtFormDriver::click(model::HostedControl& control, model::Part& part) {
-    if (is_page(control)) return pages_.click(control, part);
-    qt::QtSite& site = window_.site_of(control);
+    qt::QtSite& site = any_site(control);
     model::InputPart& p = deliverable(site, part, "Click");
     QWidget* view = site.view_of(part);
     // A click on an edit field also puts the caret where it lands, which the script's click
@@ -220,8 +244,7 @@ void QtFormDriver::click(model::HostedControl& control, model::Part& part) {
 }
 
 void QtFormDriver::dbl_click(model::HostedControl& control, model::Part& part) {
-    if (is_page(control)) return pages_.dbl_click(control, part);
-    qt::QtSite& site = window_.site_of(control);
+    qt::QtSite& site = any_site(control);
     model::InputPart& p = deliverable(site, part, "DblClick");
     // Qt makes a double click of two presses, each of them a click of its own: the
     // notification alone goes to the model.
@@ -231,8 +254,7 @@ void QtFormDriver::dbl_click(model::HostedControl& control, model::Part& part) {
 }
 
 void QtFormDriver::notify(model::HostedControl& control, model::Part& part, std::string_view notification) {
-    if (is_page(control)) return pages_.notify(control, part, notification);
-    qt::QtSite& site = window_.site_of(control);
+    qt::QtSite& site = any_site(control);
     model::InputPart& p = deliverable(site, part, notification);
     const std::string name = *model::find_notification(p, notification);
     for (std::string_view keyed : {"KeyDown", "KeyUp", "KeyPress", "MouseDown", "MouseUp", "MouseMove"})
@@ -255,8 +277,7 @@ void QtFormDriver::notify(model::HostedControl& control, model::Part& part, std:
 // edit field also moves its caret. The model takes the button as the script gives it.
 void QtFormDriver::mouse(model::HostedControl& control, model::Part& part, bool down, int16_t button, int16_t shift,
                          float x, float y) {
-    if (is_page(control)) return pages_.mouse(control, part, down, button, shift, x, y);
-    qt::QtSite& site = window_.site_of(control);
+    qt::QtSite& site = any_site(control);
     model::InputPart& p = deliverable(site, part, down ? "MouseDown" : "MouseUp");
     to_model([&] {
         if (takes_input(site, p)) p.user_mouse(down, button, shift, x, y);
@@ -264,20 +285,21 @@ void QtFormDriver::mouse(model::HostedControl& control, model::Part& part, bool 
 }
 
 void QtFormDriver::resize(model::HostedControl& control, float width, float height) {
-    if (is_page(control)) return pages_.resize(control, width, height);
+    if (qt::PageWidget* page = page_of(control)) {
+        page->site().surface_model().set_size(width, height);
+        return run_pending();
+    }
     window_.resize(control, width, height);
 }
 
 void QtFormDriver::run_pending() {
     window_.run_pending();
-    pages_.run_pending();
 }
 
 void QtFormDriver::members_changed() { window_.sync(); }
 
 void QtFormDriver::check_views(model::HostedControl& control) {
-    if (is_page(control)) return;
-    qt::QtSite& site = window_.site_of(control);
+    qt::QtSite& site = any_site(control);
     for (auto& [name, part] : site.parts()) {
         QWidget* view = site.view_of(*part);
         auto* combo = dynamic_cast<qt::ComboView*>(view);

@@ -6,16 +6,16 @@
 //
 // What has no faithful Qt event goes to the models directly, as the minimal host delivers
 // it (each such call says why): a lone key down, key press or key up, a paste, a selection
-// set by the script, clicks on edit fields, mouse buttons at twip positions, and everything
-// on property pages, which run on a minimal-host form beside the window until they have a
-// Qt view of their own.
+// set by the script, clicks on edit fields, mouse buttons at twip positions. Property pages
+// are Qt page widgets of their own beside the window (not focusable, as on the minimal host):
+// clicks on their buttons are real clicks.
 #include <memory>
 #include <string>
 #include <string_view>
 #include <vector>
 
-#include "keltext/minihost/form.h"
 #include "keltext/qt/form_window.h"
+#include "keltext/qt/page_view.h"
 #include "keltext/widgetmodel/hosted.h"
 
 namespace kel::kelform {
@@ -65,6 +65,9 @@ public:
 
 private:
     bool is_page(model::HostedControl& control);
+    qt::PageWidget* page_of(model::HostedControl& control);
+    // The site of a control of the window or of an open page.
+    qt::QtSite& any_site(model::HostedControl& control);
     qt::QtSite& focused_site();
     void check_name_free(const std::string& name);
     // The input part of `part` that may take `notification`, as the minimal host checks it.
@@ -75,7 +78,8 @@ private:
     void to_model(F&& f);
 
     qt::FormWindow window_;
-    mini::Form pages_;  // property pages, on controls of the window
+    // Property pages, on controls of the window; declared last, they go first.
+    std::vector<std::unique_ptr<qt::PageWidget>> pages_;
 };
 
 }  // namespace kel::kelform

@@ -35,23 +35,6 @@ Variant coerce_like(const Variant& value, const Variant& given) {
 
 }  // namespace
 
-Dispatch& PagePart::selected_control(std::size_t i) {
-    if (i >= selected_.size()) raise_error(kInvalidPropertyIndex);
-    return selected_[i]->dispatch();
-}
-
-Variant PagePart::peek(std::string_view member, std::optional<int32_t> index) const {
-    model::no_index(index);
-    if (same_name(member, "Changed")) return changed_;
-    raise_error(kNoSuchMember);
-}
-
-void PagePart::poke(std::string_view member, const Variant& value, std::optional<int32_t> index) {
-    model::no_index(index);
-    if (same_name(member, "Changed")) return Changed(to_bool(value));
-    raise_error(kNoSuchMember);
-}
-
 MiniSite::MiniSite(FormServices& form, const ClassInfo& cls, std::string name, float width, float height,
                    std::optional<std::vector<HostedControl*>> selected)
     : form_(form),

@@ -10,6 +10,7 @@
 #include "keltext/host/container.h"
 #include "keltext/host/members.h"
 #include "keltext/minihost/form.h"
+#include "keltext/widgetmodel/page_part.h"
 #include "keltext/widgetmodel/surface.h"
 #include "keltext/widgetmodel/widget_base.h"
 
@@ -34,26 +35,7 @@ public:
     virtual model::Clipboard& clipboard() = 0;
 };
 
-// The part "page" of a property page: its Changed flag, and the design-time services.
-class PagePart final : public Part, public PageServices {
-public:
-    explicit PagePart(std::vector<HostedControl*> selected) : selected_(std::move(selected)) {}
-
-    std::size_t selected_count() const override { return selected_.size(); }
-    Dispatch& selected_control(std::size_t i) override;  // 381 past the end
-    bool Changed() const override { return changed_; }
-    void Changed(bool v) override { changed_ = v; }
-
-    std::string_view widget_type() const override { return "Page"; }
-    std::vector<std::string> members() const override { return {"Changed"}; }
-    std::vector<std::string> notifications() const override { return {}; }
-    Variant peek(std::string_view member, std::optional<int32_t> index = std::nullopt) const override;
-    void poke(std::string_view member, const Variant& value, std::optional<int32_t> index = std::nullopt) override;
-
-private:
-    std::vector<HostedControl*> selected_;
-    bool changed_ = false;
-};
+using model::PagePart;
 
 class MiniSite final : public Site, public HostedControl, public WidgetContext, private Keyboard {
 public:

@@ -1,5 +1,6 @@
 #include "keltext/qt/site.h"
 
+#include <QApplication>
 #include <cmath>
 
 #include "keltext/host/conversions.h"
@@ -35,13 +36,14 @@ Variant coerce_like(const Variant& value, const Variant& given) {
 }  // namespace
 
 QtSite::QtSite(Services& services, const ClassInfo& cls, std::string name, QWidget& container, SiteOwner* owner,
-               float width, float height)
+               float width, float height, std::optional<std::vector<model::HostedControl*>> selected)
     : services_(services),
       info_(cls),
       name_(std::move(name)),
       container_(container),
       owner_(owner),
       surface_(services.next_handle(), width, height, [this] { raise_resize(); }) {
+    if (selected) page_ = std::make_unique<model::PagePart>(std::move(*selected));
     services_.add_site(this);
 }
 
@@ -165,6 +167,7 @@ Frame& QtSite::create_frame(std::string_view name) { return add_part<model::Fram
 
 model::Part* QtSite::part(std::string_view name) {
     if (same_name(name, "surface")) return &surface_;
+    if (page_ && same_name(name, "page")) return page_.get();
     for (auto& p : parts_)
         if (same_name(p.name, name)) return p.model.get();
     return nullptr;
@@ -205,6 +208,10 @@ std::optional<std::string> QtSite::shown_text(const model::Part& part) {
 
 model::InputPart* QtSite::input_target() {
     model::InputPart* p = keyboard_part_;
+    // A page has several edit fields, each taking its keys while it has Qt's focus.
+    if (page_)
+        if (model::InputPart* focused = part_of_view(QApplication::focusWidget()); focused && focused->is_edit_field())
+            p = focused;
     if (!p || !surface_.Enabled() || !p->input_enabled()) return nullptr;
     return p;
 }

@@ -23,6 +23,7 @@
 #include "keltext/host/container.h"
 #include "keltext/host/members.h"
 #include "keltext/widgetmodel/hosted.h"
+#include "keltext/widgetmodel/page_part.h"
 #include "keltext/widgetmodel/surface.h"
 #include "keltext/widgetmodel/widget_base.h"
 
@@ -53,7 +54,7 @@ public:
 class QtSite final : public Site, public model::HostedControl, public model::WidgetContext, private Keyboard {
 public:
     QtSite(Services& services, const ClassInfo& cls, std::string name, QWidget& container, SiteOwner* owner,
-           float width, float height);
+           float width, float height, std::optional<std::vector<model::HostedControl*>> selected = std::nullopt);
     ~QtSite() override;
     QtSite(const QtSite&) = delete;
     QtSite& operator=(const QtSite&) = delete;
@@ -67,7 +68,7 @@ public:
     void raise_event(int number, std::string_view name, std::span<EventArg> args) override;
     Surface& surface() override { return surface_; }
     Keyboard& keyboard() override { return *this; }
-    PageServices* page_services() override { return nullptr; }
+    PageServices* page_services() override { return page_.get(); }
     EditBox& create_edit_box(std::string_view name) override;
     ComboBox& create_combo_box(std::string_view name) override;
     MaskedEdit& create_masked_edit(std::string_view name) override;
@@ -88,7 +89,7 @@ public:
     std::vector<std::pair<std::string, model::Part*>> parts() override;
     model::Part& surface_part() override { return surface_; }
     model::Part* keyboard_part() override { return keyboard_part_; }
-    bool can_take_focus() const override { return surface_.Enabled(); }
+    bool can_take_focus() const override { return !page_ && surface_.Enabled(); }
 
     // WidgetContext
     model::Clipboard* clipboard() override;
@@ -116,6 +117,8 @@ public:
     // Whether input reaches the keyboard part now: the surface and the widget enabled.
     model::InputPart* input_target();
     bool has_control() const { return control_ != nullptr; }
+    // A property page's site (`selected` given): its part "page"; null for a control.
+    model::PagePart* page_part() { return page_.get(); }
 
     void sync_views();
     int to_pixels(float twips) const;
@@ -154,6 +157,7 @@ private:
     std::vector<PartEntry> parts_;
     model::InputPart* keyboard_part_ = nullptr;
     QWidget* focus_view_ = nullptr;
+    std::unique_ptr<model::PagePart> page_;
     // Declared last, destroyed first: the control lets go of its constituents before they go.
     std::unique_ptr<Control> control_;
     std::unique_ptr<BoundControl> bound_;
