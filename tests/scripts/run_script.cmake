@@ -1,9 +1,14 @@
-# Runs one script through `kelform play` and compares what it prints with the golden file.
+# Runs one script through `kelform play` (on the host HOST, when given) and compares what it
+# prints with the golden file.
 get_filename_component(dir ${SCRIPT} DIRECTORY)
 get_filename_component(name ${SCRIPT} NAME_WE)
 set(expected_file ${dir}/${name}.out)
 set(status_file ${dir}/${name}.status)
-execute_process(COMMAND ${KELFORM} play ${name}.kfs
+set(host_args)
+if(DEFINED HOST)
+  set(host_args --host ${HOST})
+endif()
+execute_process(COMMAND ${KELFORM} play ${host_args} ${name}.kfs
   WORKING_DIRECTORY ${dir}
   OUTPUT_VARIABLE actual ERROR_VARIABLE errors RESULT_VARIABLE status TIMEOUT 60)
 set(expected_status 0)
