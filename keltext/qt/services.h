@@ -83,6 +83,15 @@ public:
     void add_site(QtSite* site);
     void remove_site(QtSite* site);
 
+    // A lone key down, key press or key up, straight to the control's edit field (input with no
+    // faithful Qt event: a driver's `keydown`, `keypress`, `keyup`), as the minimal form
+    // delivers it; then the keys it queued. Key down flips the Insert toggle as the key does.
+    void key_down(QtSite& site, int16_t key_code, int16_t shift);
+    void key_press(QtSite& site, int16_t char_code);
+    void key_up(QtSite& site, int16_t key_code, int16_t shift);
+    // Text put into the control's edit field as a paste (Windows-1252).
+    void paste(QtSite& site, std::string_view cp1252);
+
     // The views hand their input events here. True when the event was the host's (the view
     // does nothing more with it).
     bool route_key_press(QtSite& site, QKeyEvent* e);

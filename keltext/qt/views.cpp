@@ -254,9 +254,17 @@ bool ComboView::event(QEvent* e) {
     switch (e->type()) {
     case QEvent::ShortcutOverride:
         return s.route_shortcut_override(site_, static_cast<QKeyEvent*>(e));
-    case QEvent::KeyPress:
-        s.route_key_press(site_, static_cast<QKeyEvent*>(e));
+    case QEvent::KeyPress: {
+        auto* k = static_cast<QKeyEvent*>(e);
+        s.route_key_press(site_, k);
+        // After the control had the key, F4 and Alt+Down or Alt+Up open the list, as the
+        // terminal form does.
+        const bool alt = k->modifiers() == Qt::AltModifier;
+        if ((k->key() == Qt::Key_F4 && k->modifiers() == Qt::NoModifier) ||
+            (alt && (k->key() == Qt::Key_Down || k->key() == Qt::Key_Up)))
+            showPopup();
         return true;
+    }
     case QEvent::KeyRelease:
         s.route_key_release(site_, static_cast<QKeyEvent*>(e));
         return true;

@@ -7,10 +7,12 @@
 #include <QComboBox>
 #include <QInputMethodEvent>
 #include <QLineEdit>
+#include <QListWidget>
 #include <QMenu>
 #include <QTest>
 #include <QTimer>
 #include <algorithm>
+#include <cmath>
 
 #include "keltext/host/charset.h"
 #include "keltext/host/conversions.h"
@@ -81,6 +83,8 @@ private slots:
     void clipboard_keys_and_shift_insert();
     void combo_list_never_rewrites_the_edit_text();
     void disabled_surface_takes_no_focus_and_is_not_greyed();
+    void sizes_are_twips_and_pixels_follow();
+    void combo_list_opens_and_a_pick_is_the_models();
 };
 
 void QtHostTest::keys_from_qt_events_data() {
@@ -343,6 +347,44 @@ void QtHostTest::disabled_surface_takes_no_focus_and_is_not_greyed() {
     QTest::keyClick(first.focus_view(), Qt::Key_Tab);
     QCOMPARE(form.focused(), &last);
     QVERIFY(off.focus_view()->isEnabled());
+}
+
+void QtHostTest::sizes_are_twips_and_pixels_follow() {
+    FormWindow form;
+    QtSite& c = form.create(*form.services().catalogue().find("KelCombo"), "c");
+    QWidget& w = c.container();
+    const double dpi = w.logicalDpiX();
+    // The driver's size in twips stands as given; the widget shows it at the logical DPI.
+    form.resize(c, 3001, 315);
+    QCOMPARE(c.surface_model().Width(), 3001.0f);
+    QCOMPARE(w.width(), int(std::lround(3001 * dpi / 1440)));
+    const float height = c.surface_model().Height();
+    // A size Qt gives (a layout) reaches the control in twips; the control keeps its height.
+    w.resize(300, w.height() + 20);
+    QCOMPARE(c.surface_model().Width(), float(300 * 1440 / dpi));
+    QCOMPARE(c.surface_model().Height(), height);
+    QCOMPARE(w.height(), int(std::lround(height * dpi / 1440)));
+}
+
+void QtHostTest::combo_list_opens_and_a_pick_is_the_models() {
+    FormWindow form;
+    Recorder events;
+    form.set_observer(&events);
+    QtSite& c = form.create(*form.services().catalogue().find("KelCombo"), "c");
+    c.dispatch().call("AddItem", {Variant("Cash")});
+    c.dispatch().call("AddItem", {Variant("Card")});
+    form.focus(&c);
+    QTest::keyClick(c.focus_view(), Qt::Key_F4);
+    QCOMPARE(events.count("c.DropDown"), 1);
+    auto* popup = c.focus_view()->findChild<QListWidget*>();
+    QVERIFY(popup && popup->isVisible());
+    QCOMPARE(popup->count(), 2);
+    emit popup->itemClicked(popup->item(1));
+    QCOMPARE(peek_text(c), std::string("Card"));
+    QCOMPARE(c.dispatch().get("ListIndex"), Variant(int16_t{1}));
+    QCOMPARE(events.count("c.Click"), 1);
+    QCOMPARE(shown(c), std::string("Card"));
+    form.set_observer(nullptr);
 }
 
 QTEST_MAIN(QtHostTest)
