@@ -63,6 +63,9 @@ public:
     void members_changed() override;
     void check_views(model::HostedControl& control) override;
 
+    // The window the controls stand in (a desktop form lays them out and adds its labels).
+    qt::FormWindow& form_window() { return window_; }
+
 private:
     bool is_page(model::HostedControl& control);
     qt::PageWidget* page_of(model::HostedControl& control);

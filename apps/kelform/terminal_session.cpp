@@ -73,16 +73,7 @@ Part* part_of_type(HostedControl& control, std::string_view type) {
     return nullptr;
 }
 
-bool is_class(const HostedControl& c, std::string_view name) { return same_name(c.info().name, name); }
-
-// Late-bound read of a property; nothing when the control refuses it.
-std::optional<Variant> property(HostedControl& c, std::string_view name) {
-    try {
-        return c.dispatch().get(name);
-    } catch (const RuntimeError&) {
-        return std::nullopt;
-    }
-}
+std::optional<Variant> property(HostedControl& c, std::string_view name) { return control_property(c, name); }
 
 int weekday(Date d) { return ((d.serial + 6) % 7 + 7) % 7; }  // 0 Sunday; day 0 was a Saturday
 
@@ -98,7 +89,7 @@ Date add_months(int year, int month, int day, int delta) {
 }  // namespace
 
 TerminalSession::TerminalSession(mini::FormDriver& form, const SavedForm& saved, Date today)
-    : form_(form), saved_(saved), today_(today) {
+    : form_(form), saved_(saved), today_(today), code_(saved) {
     for (std::size_t i = 0; i < saved_.controls.size(); ++i) {
         const SavedControl& c = saved_.controls[i];
         saved_index_.try_emplace(name_key(c.name), i);
@@ -134,15 +125,7 @@ TerminalSession::~TerminalSession() { form_.set_observer(nullptr); }
 
 // ---- the form's own code -------------------------------------------------------------------
 
-std::string TerminalSession::label_of(const HostedControl& control) const {
-    const auto it = saved_index_.find(name_key(control.name()));
-    if (it == saved_index_.end()) return control.name();
-    const std::string& label = saved_.controls[it->second].label;
-    if (label.empty()) return control.name();
-    // "Amount (Rs)" is "Amount" on the status line, which speaks UTF-8 like the terminal.
-    const auto paren = label.find(" (");
-    return to_utf8(paren == std::string::npos || paren == 0 ? label : label.substr(0, paren));
-}
+std::string TerminalSession::label_of(const HostedControl& control) const { return code_.label_of(control); }
 
 void TerminalSession::log(std::string line) {
     events_.push_back(std::move(line));
@@ -155,25 +138,9 @@ void TerminalSession::event_raised(HostedControl& control, int /*number*/, std::
     for (const EventArg& a : args) line += " " + std::string(a.name) + "=" + format_plain(a.value);
     log(std::move(line));
 
-    if (same_name(event, "ControlError")) {
-        const auto decimals = property(control, "NoOfDecimals");
-        const auto length = property(control, "MaxLength");
-        std::string rule = "digits and one decimal point";
-        if (decimals && length) {
-            const int d = static_cast<int>(decimals->number());
-            const int n = static_cast<int>(length->number());
-            rule = d > 0 ? "up to " + std::to_string(std::max(n - d - 1, 0)) + " digits, a point and " +
-                               std::to_string(d) + " decimals"
-                         : "up to " + std::to_string(n) + " digits";
-        }
-        say(label_of(control) + ": key refused - " + rule);
-    } else if (same_name(event, "DateError")) {
-        const auto style = property(control, "DateStyle");
-        if (style && style->number() == 1)
-            say(label_of(control) + ": give a month 01-12 and a two-digit year (mm/yy)");
-        else
-            say(label_of(control) + ": not a real date (dd/mm/yyyy)");
-    } else if (same_name(event, "ButtonClick")) {
+    if (const auto status = code_.event_status(control, event)) {
+        say(*status);
+    } else if (FormCode::opens_calendar(event)) {
         open_calendar(control);
     }
 }
@@ -184,18 +151,13 @@ void TerminalSession::keys_sent(HostedControl& control, std::string_view keys) {
 
 void TerminalSession::handler_error(std::string_view where, int number) {
     log(std::string(where) + " -> " + format_error(number));
-    say(std::string(where) + ": error " + std::to_string(number) + " (" + error_description(number) + ")");
+    say(FormCode::handler_error_status(where, number));
 }
 
 void TerminalSession::keep_failed_date(HostedControl* left) {
-    if (!left || left == form_.focused() || !is_class(*left, "KelDateMask")) return;
-    const auto allow = property(*left, "AllowLostFocus");
-    if (!allow || allow->number() != 0) return;
-    // Entering the box again clears the flag, so a second attempt to leave is let through:
-    // the form insists once and explains, it never locks the person in.
+    if (!FormCode::keeps_focus(form_, left)) return;
     form_.focus(left);
-    if (status_.empty()) say(label_of(*left) + ": the date is not right");
-    status_ += " - focus stays; leave again to keep it";
+    say(code_.kept_focus_status(*left, status_));
 }
 
 // ---- input ---------------------------------------------------------------------------------
@@ -514,16 +476,7 @@ bool TerminalSession::list_key(int16_t key, int16_t shift) {
 // ---- the calendar --------------------------------------------------------------------------
 
 void TerminalSession::open_calendar(HostedControl& control) {
-    // The box's own date, else today, brought into the box's range.
-    Part* field = control.keyboard_part();
-    const auto text = peek(field, "Text");
-    std::optional<Date> day = text ? recognize_date_text(text->str()) : std::nullopt;
-    Date d = day.value_or(today_);
-    const auto lo = property(control, "MinDate");
-    const auto hi = property(control, "MaxDate");
-    if (const auto min = lo ? recognize_date(*lo) : std::nullopt; min && d < *min) d = *min;
-    if (const auto max = hi ? recognize_date(*hi) : std::nullopt; max && d > *max) d = *max;
-    const Ymd ymd = to_ymd(d);
+    const Ymd ymd = to_ymd(FormCode::calendar_start(control, today_));
     list_.reset();
     calendar_ = Calendar{control.name(), ymd.year, ymd.month, ymd.day};
 }
@@ -536,20 +489,12 @@ void TerminalSession::pick_calendar_day() {
         calendar_.reset();
         return;
     }
-    const auto lo = property(*control, "MinDate");
-    const auto hi = property(*control, "MaxDate");
-    const auto min = lo ? recognize_date(*lo) : std::nullopt;
-    const auto max = hi ? recognize_date(*hi) : std::nullopt;
-    if ((min && *day < *min) || (max && *day > *max)) {
-        std::string range = min && max ? date_text(*min) + " to " + date_text(*max)
-                            : min      ? "from " + date_text(*min)
-                                       : "up to " + date_text(*max);
-        say(label_of(*control) + ": pick a day " + range);
+    if (const auto refused = code_.refuse_day(*control, *day)) {
+        say(*refused);
         return;
     }
     calendar_.reset();
-    if (form_.focused() != control) form_.focus(control);
-    control->dispatch().set("Text", Variant(*day));
+    FormCode::pick_day(form_, *control, *day);
 }
 
 bool TerminalSession::calendar_key(int16_t key, int16_t shift) {
@@ -754,8 +699,7 @@ std::vector<TerminalSession::Layout> TerminalSession::layout() {
 
 std::optional<TerminalSession::CalendarPlace> TerminalSession::calendar_place(const Layout& box, int rows,
                                                                                int cols) const {
-    const auto pos = property(*box.control, "CalendarPosition");
-    const int corner = pos ? static_cast<int>(pos->number()) : 2;
+    const int corner = FormCode::calendar_corner(*box.control);
     const bool top_first = corner == 0 || corner == 1;
     const bool right = corner == 1 || corner == 3;
     // The calendar may use every row below the title bar, the help and status lines too, but

@@ -13,6 +13,7 @@
 #include <unordered_map>
 #include <vector>
 
+#include "apps/kelform/form_code.h"
 #include "apps/kelform/form_file.h"
 #include "apps/kelform/terminal_canvas.h"
 #include "keltext/host/date.h"
@@ -149,6 +150,7 @@ private:
     mini::FormDriver& form_;
     const SavedForm& saved_;
     Date today_;
+    FormCode code_;  // the form's code, shared with the desktop form
     std::string status_;
     std::deque<std::string> events_;
     bool events_shown_ = false;
