@@ -120,16 +120,23 @@ bool DesktopForm::save_record() {
     return true;
 }
 
-std::optional<std::string> DesktopForm::finish() {
-    // The field being edited is completed first, as leaving it would.
-    if (model::HostedControl* editing = driver_.focused()) {
-        driver_.focus(nullptr);
-        if (FormCode::keeps_focus(driver_, editing)) {
-            driver_.focus(editing);
-            say(code_.kept_focus_status(*editing, status_->text().toStdString()));
-            return std::nullopt;
-        }
+// Saving and finishing complete the field being edited first, as a form's OK button does:
+// focus leaves it (and with `come_back` returns), so it formats and checks its value.
+bool DesktopForm::complete_field(bool come_back) {
+    model::HostedControl* editing = driver_.focused();
+    if (!editing) return true;
+    driver_.focus(nullptr);
+    if (FormCode::keeps_focus(driver_, editing)) {
+        driver_.focus(editing);
+        say(code_.kept_focus_status(*editing, status_->text().toStdString()));
+        return false;
     }
+    if (come_back) driver_.focus(editing);
+    return true;
+}
+
+std::optional<std::string> DesktopForm::finish() {
+    if (!complete_field(false)) return std::nullopt;
     if (record_path_ && !save_record()) return std::nullopt;
     std::string json = record_json(driver_);
     emit finished(qtext(json));
@@ -209,7 +216,7 @@ bool DesktopForm::eventFilter(QObject* watched, QEvent* event) {
             return true;
         }
         if (key->key() == Qt::Key_S && mods == Qt::ControlModifier) {
-            save_record();
+            if (complete_field(true)) save_record();
             return true;
         }
         if (key->key() == Qt::Key_F10 && mods == Qt::NoModifier) {

@@ -56,6 +56,7 @@ private:
     void open_list(model::HostedControl& control);
     void open_calendar(model::HostedControl& control);
     void after_input(model::HostedControl* before);
+    bool complete_field(bool come_back);
 
     const SavedForm& saved_;
     Date today_;
