@@ -19,6 +19,7 @@
 #include "apps/kelform/text_file.h"
 #include "keltext/host/charset.h"
 #include "keltext/host/conversions.h"
+#include "keltext/host/float_chars.h"
 #include "keltext/host/font.h"
 #include "keltext/minihost/property_store.h"
 #include "keltext/host/errors.h"
@@ -52,14 +53,14 @@ std::optional<int> parse_cell(std::string_view s) {
 std::optional<float> parse_twips(std::string_view s) {
     if (s.empty() || !((s[0] >= '0' && s[0] <= '9') || s[0] == '.')) return std::nullopt;
     float v = 0;
-    const auto [end, ec] = std::from_chars(s.data(), s.data() + s.size(), v);
+    const auto [end, ec] = parse_float(s.data(), s.data() + s.size(), v);
     if (ec != std::errc() || end != s.data() + s.size() || !(v > 0) || v > kMaxTwips) return std::nullopt;
     return v;
 }
 
 std::string float_text(float v) {
     char buf[32];
-    const auto r = std::to_chars(buf, buf + sizeof buf, v);
+    const auto r = format_float(buf, buf + sizeof buf, v);
     return std::string(buf, r.ptr);
 }
 
@@ -291,10 +292,10 @@ namespace {
 // (5000000, not 5e+06), so that a person reads the file easily.
 std::string shortest_text(double v) {
     char buf[400];
-    if (const auto r = std::to_chars(buf, buf + sizeof buf, v, std::chars_format::fixed);
+    if (const auto r = format_float(buf, buf + sizeof buf, v, std::chars_format::fixed);
         r.ec == std::errc() && r.ptr - buf <= 20)
         return std::string(buf, r.ptr);
-    const auto r = std::to_chars(buf, buf + sizeof buf, v);
+    const auto r = format_float(buf, buf + sizeof buf, v);
     return std::string(buf, r.ptr);
 }
 

@@ -9,6 +9,7 @@
 #include <system_error>
 
 #include "keltext/host/conversions.h"
+#include "keltext/host/float_chars.h"
 #include "keltext/host/date.h"
 #include "keltext/host/font.h"
 
@@ -108,7 +109,7 @@ DecimalShape decimal_shape(std::string_view s) {
     return shape;
 }
 
-// from_chars takes no '+'.
+// parse_float takes no '+'.
 std::string_view without_plus(std::string_view s) { return (!s.empty() && s[0] == '+') ? s.substr(1) : s; }
 
 template <class F>
@@ -116,7 +117,7 @@ std::optional<F> read_floating(std::string_view s) {
     if (!decimal_shape(s).ok) return std::nullopt;
     s = without_plus(s);
     F value{};
-    auto [end, ec] = std::from_chars(s.data(), s.data() + s.size(), value);
+    auto [end, ec] = parse_float(s.data(), s.data() + s.size(), value);
     if (ec != std::errc() || end != s.data() + s.size() || !std::isfinite(value)) return std::nullopt;
     return value;
 }
