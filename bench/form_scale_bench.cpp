@@ -12,7 +12,7 @@
 #include "keltext/host/date.h"
 #include "keltext/library/catalogue.h"
 #include "keltext/minihost/form.h"
-#include "keltext/minihost/keyboard.h"
+#include "keltext/widgetmodel/keyboard.h"
 
 namespace {
 

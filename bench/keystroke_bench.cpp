@@ -11,7 +11,7 @@
 
 #include "keltext/library/catalogue.h"
 #include "keltext/minihost/form.h"
-#include "keltext/minihost/keyboard.h"
+#include "keltext/widgetmodel/keyboard.h"
 
 namespace {
 
@@ -55,17 +55,17 @@ void type_into(benchmark::State& state, const Setup& setup) {
                         : form.create(*cls, "c");
     for (const auto& [name, value] : setup.properties) control.dispatch().set(name, value);
     form.focus(&control);
-    kel::mini::Part* field = control.keyboard_part();
+    kel::model::Part* field = control.keyboard_part();
     const kel::Variant empty_text = field->peek("Text");
 
     // The keystrokes of one iteration, worked out beforehand.
-    std::vector<kel::mini::Keystroke> keys;
-    const kel::mini::Keystroke backspace = *kel::mini::parse_key("Backspace");
+    std::vector<kel::model::Keystroke> keys;
+    const kel::model::Keystroke backspace = *kel::model::parse_key("Backspace");
     const std::string typed = setup.typed;
     // Whole cycles only, so that every iteration starts from the empty field again.
     const size_t cycle = 2 * typed.size() + 1;
     while (keys.size() + cycle <= kKeystrokes) {
-        for (char c : typed) keys.push_back(kel::mini::keystroke_for_char(static_cast<uint8_t>(c)));
+        for (char c : typed) keys.push_back(kel::model::keystroke_for_char(static_cast<uint8_t>(c)));
         for (size_t i = 0; i <= typed.size(); ++i) keys.push_back(backspace);
     }
 

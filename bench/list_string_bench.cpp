@@ -7,11 +7,11 @@
 #include <string_view>
 
 #include "keltext/combo/list_string.h"
-#include "keltext/minihost/list_widgets.h"
+#include "keltext/widgetmodel/list_widgets.h"
 
 namespace {
 
-class NoHandlers final : public kel::mini::WidgetContext {
+class NoHandlers final : public kel::model::WidgetContext {
 public:
     void handler_error(std::string_view, std::string_view, int) override {}
 };
@@ -37,7 +37,7 @@ std::string list_string_of(int64_t entries) {
 void BM_DecodeFillList(benchmark::State& state) {
     const std::string s = list_string_of(state.range(0));
     NoHandlers context;
-    kel::mini::MiniListBox list(context, "lstList", 1, 1200, 2000);
+    kel::model::ListBoxModel list(context, "lstList", 1, 1200, 2000);
     for (auto _ : state) {
         kel::DecodeFillList(list, s);
         benchmark::DoNotOptimize(list.ListCount());
@@ -51,7 +51,7 @@ BENCHMARK(BM_DecodeFillList)->RangeMultiplier(10)->Range(1000, 1000000)->Unit(be
 void BM_EncodeFillList(benchmark::State& state) {
     const std::string s = list_string_of(state.range(0));
     NoHandlers context;
-    kel::mini::MiniListBox list(context, "lstList", 1, 1200, 2000);
+    kel::model::ListBoxModel list(context, "lstList", 1, 1200, 2000);
     kel::DecodeFillList(list, s);
     for (auto _ : state) {
         std::string encoded = kel::EncodeFillList(list);

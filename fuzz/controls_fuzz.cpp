@@ -28,15 +28,15 @@
 #include "keltext/host/variant.h"
 #include "keltext/library/catalogue.h"
 #include "keltext/minihost/form.h"
-#include "keltext/minihost/keyboard.h"
-#include "keltext/minihost/part.h"
+#include "keltext/widgetmodel/keyboard.h"
+#include "keltext/widgetmodel/part.h"
 
 namespace {
 
 using kel::Variant;
 using kel::mini::Form;
 using kel::mini::HostedControl;
-using kel::mini::Part;
+using kel::model::Part;
 
 constexpr const char* kControlClasses[] = {"KelAlphaNumeric", "KelNumeric", "KelDateMask", "KelCombo"};
 constexpr size_t kMaxControls = 8;
@@ -258,13 +258,13 @@ struct Driver {
             case 1: {
                 // Typed text: characters a person types, a few at a time.
                 const std::string text = any_text(in);
-                for (char ch : text) form.keystroke(kel::mini::keystroke_for_char(static_cast<uint8_t>(ch)));
+                for (char ch : text) form.keystroke(kel::model::keystroke_for_char(static_cast<uint8_t>(ch)));
                 break;
             }
             case 2: {
                 const std::string name = std::string(kPrefixes[in.ConsumeIntegralInRange<size_t>(0, std::size(kPrefixes) - 1)]) +
                                          kKeyNames[in.ConsumeIntegralInRange<size_t>(0, std::size(kKeyNames) - 1)];
-                if (auto k = kel::mini::parse_key(name)) form.keystroke(*k);
+                if (auto k = kel::model::parse_key(name)) form.keystroke(*k);
                 break;
             }
             case 3: form.key_down(in.ConsumeIntegral<int16_t>(), in.ConsumeIntegralInRange<int16_t>(0, 7)); break;

@@ -11,11 +11,11 @@
 
 #include "fuzz/fuzz_check.h"
 #include "keltext/combo/list_string.h"
-#include "keltext/minihost/list_widgets.h"
+#include "keltext/widgetmodel/list_widgets.h"
 
 namespace {
 
-class NoHandlers final : public kel::mini::WidgetContext {
+class NoHandlers final : public kel::model::WidgetContext {
 public:
     void handler_error(std::string_view, std::string_view, int) override {}
 };
@@ -49,7 +49,7 @@ void decode(kel::ListWidget& list, std::string_view s) {
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
     FuzzedDataProvider in(data, size);
     NoHandlers context;
-    kel::mini::MiniListBox list(context, "lstList", 1, 1200, 2000);
+    kel::model::ListBoxModel list(context, "lstList", 1, 1200, 2000);
 
     if (in.ConsumeBool()) {
         // Any bytes; then the decoded list must survive an encode and decode.

@@ -535,7 +535,7 @@ SavedForm capture_form(mini::Form& form, const SavedForm& saved) {
             c.row = std::min(next_row, kMaxCell);
             c.col = 20;
             next_row += 2;
-            mini::Part& surface = hosted->surface_part();
+            model::Part& surface = hosted->surface_part();
             c.width = static_cast<float>(surface.peek("Width").number());
             c.height = static_cast<float>(surface.peek("Height").number());
             place = out.controls.size();

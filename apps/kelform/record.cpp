@@ -11,7 +11,7 @@
 #include "keltext/host/date_recognizer.h"
 #include "keltext/host/errors.h"
 #include "keltext/host/members.h"
-#include "keltext/minihost/part.h"
+#include "keltext/widgetmodel/part.h"
 
 namespace kel::kelform {
 namespace {
@@ -47,7 +47,7 @@ Json value_of(mini::HostedControl& c) {
     const Field field = field_of(c);
     if (field == Field::number) {
         // The box's Text reads 0 when it is empty: the edit text tells blank from zero.
-        const mini::Part* edit = c.keyboard_part();
+        const model::Part* edit = c.keyboard_part();
         if (edit && edit->peek("Text").str().empty()) return nullptr;
         const double v = text_of_control(c).number();
         if (!std::isfinite(v)) return nullptr;

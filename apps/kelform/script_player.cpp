@@ -103,7 +103,7 @@ std::span<const std::string_view> Args::rest() const {
 struct Player::Member {
     mini::HostedControl* control = nullptr;
     const PropertyInfo* property = nullptr;  // a property of the control, or
-    mini::Part* part = nullptr;              // a member of one of its parts
+    model::Part* part = nullptr;              // a member of one of its parts
     std::string member;
     std::optional<Variant> index;
     std::string label;  // as printed: NAME.Prop(0), NAME.part.Member
@@ -224,7 +224,7 @@ void Player::guarded(std::string_view label, const std::function<void()>& action
 
 Player::PartRef Player::resolve_part(std::string_view control_name, std::string_view part_name) {
     mini::HostedControl& c = find_control(control_name);
-    mini::Part* part = c.part(part_name);
+    model::Part* part = c.part(part_name);
     if (!part) throw ScriptError("unknown part '" + c.name() + "." + shown(part_name) + "'");
     std::string spelled;
     for (const auto& [name, p] : c.parts())
@@ -251,7 +251,7 @@ Player::Member Player::resolve(std::string_view word, bool allow_part, bool allo
     }
     if (t.names.size() == 3 && allow_part) {
         PartRef ref = resolve_part(t.names[0], t.names[1]);
-        std::optional<std::string> member = mini::find_member(*ref.part, t.names[2]);
+        std::optional<std::string> member = model::find_member(*ref.part, t.names[2]);
         if (!member) throw ScriptError("unknown member '" + ref.label + "." + shown(t.names[2]) + "'");
         m.control = ref.control;
         m.part = ref.part;
@@ -459,7 +459,7 @@ mini::HostedControl& Player::focused_for_input() {
     return *c;
 }
 
-void Player::keystroke(const mini::Keystroke& k) {
+void Player::keystroke(const model::Keystroke& k) {
     // Tab and Shift+Tab belong to the form: they move focus and reach no control.
     if (k.key_code == kVkTab && (k.shift & (kCtrlMask | kAltMask)) == 0) {
         guarded("form", [&] { form_->tab((k.shift & kShiftMask) == 0); });
@@ -487,14 +487,14 @@ void Player::cmd_type(Args& a) {
     std::string text = a.text("text");
     a.finish();
     for (char ch : text) {
-        keystroke(mini::keystroke_for_char(static_cast<uint8_t>(ch)));
+        keystroke(model::keystroke_for_char(static_cast<uint8_t>(ch)));
     }
 }
 
 void Player::cmd_key(Args& a) {
     std::string_view w = a.next("key");
     a.finish();
-    std::optional<mini::Keystroke> k = mini::parse_key(w);
+    std::optional<model::Keystroke> k = model::parse_key(w);
     if (!k) throw ScriptError("unknown key '" + shown(w) + "'");
     keystroke(*k);
 }
@@ -502,7 +502,7 @@ void Player::cmd_key(Args& a) {
 void Player::cmd_key_half(Args& a, bool down) {
     std::string_view w = a.next("key");
     a.finish();
-    std::optional<mini::Keystroke> k = mini::parse_key(w);
+    std::optional<model::Keystroke> k = model::parse_key(w);
     if (!k) throw ScriptError("unknown key '" + shown(w) + "'");
     mini::HostedControl& c = focused_for_input();
     guarded(c.name(), [&] {
@@ -562,7 +562,7 @@ void Player::cmd_notify(Args& a) {
     if (t.names.size() != 3 || t.index)
         throw ScriptError("expected NAME.part.Notification, got '" + shown(word) + "'");
     PartRef ref = resolve_part(t.names[0], t.names[1]);
-    std::optional<std::string> n = mini::find_notification(*ref.part, t.names[2]);
+    std::optional<std::string> n = model::find_notification(*ref.part, t.names[2]);
     if (!n) throw ScriptError("unknown notification '" + ref.label + "." + shown(t.names[2]) + "'");
     guarded(ref.label + "." + *n, [&] { form_->notify(*ref.control, *ref.part, *n); });
 }

@@ -120,7 +120,7 @@ private:
     Member resolve(std::string_view word, bool allow_part, bool allow_property);
     struct PartRef {
         mini::HostedControl* control;
-        mini::Part* part;
+        model::Part* part;
         std::string label;  // NAME.part
     };
     PartRef resolve_part(std::string_view control_name, std::string_view part_name);
@@ -128,7 +128,7 @@ private:
     std::pair<Variant, std::optional<int>> read(const Member& m);
     void write(const Member& m, const Variant& value);
     mini::HostedControl& focused_for_input();
-    void keystroke(const mini::Keystroke& k);
+    void keystroke(const model::Keystroke& k);
 
     std::span<const ClassInfo> classes_;
     std::ostream& out_;

@@ -10,15 +10,15 @@
 #include "keltext/host/conversions.h"
 #include "keltext/host/date_recognizer.h"
 #include "keltext/host/errors.h"
-#include "keltext/minihost/keyboard.h"
+#include "keltext/widgetmodel/keyboard.h"
 
 namespace kel::kelform {
 
 namespace {
 
 using mini::HostedControl;
-using mini::Keystroke;
-using mini::Part;
+using model::Keystroke;
+using model::Part;
 
 constexpr int16_t kVkF2 = kVkF1 + 1;
 constexpr int16_t kVkF4 = kVkF1 + 3;
@@ -208,7 +208,7 @@ void TerminalSession::set_record_file(std::string path, RecordWriter write) {
 std::vector<std::string> TerminalSession::raw_values() const {
     std::vector<std::string> out;
     for (HostedControl* c : form_.controls()) {
-        const mini::Part* edit = c->keyboard_part();
+        const model::Part* edit = c->keyboard_part();
         std::string text = edit ? edit->peek("Text").str() : std::string();
         if (is_class(*c, "KelNumeric")) {
             // The same amount grouped or not, padded or not, is no change.
@@ -257,7 +257,7 @@ bool TerminalSession::save_record() {
 namespace {
 
 std::string edit_text(HostedControl& c) {
-    const mini::Part* edit = c.keyboard_part();
+    const model::Part* edit = c.keyboard_part();
     return edit ? edit->peek("Text").str() : std::string();
 }
 
@@ -435,7 +435,7 @@ void TerminalSession::handle_character(char32_t ch) {
         say("'" + shown_ch + "' cannot be typed here: the form holds Windows-1252 text");
         return;
     }
-    deliver(mini::keystroke_for_char(*byte));
+    deliver(model::keystroke_for_char(*byte));
 }
 
 void TerminalSession::press_calendar_button(HostedControl& control) {

@@ -109,7 +109,7 @@ private:
     void calendar_click(int row, int col);
     void list_click(int row, int col);
 
-    void deliver(const mini::Keystroke& k);
+    void deliver(const model::Keystroke& k);
     void open_list(mini::HostedControl& control);
     void pick_list_entry(int32_t index);
     void open_calendar(mini::HostedControl& control);

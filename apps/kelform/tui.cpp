@@ -26,7 +26,7 @@
 #include <memory>
 #include <utility>
 
-#include "keltext/minihost/keyboard.h"
+#include "keltext/widgetmodel/keyboard.h"
 
 namespace kel::kelform {
 
@@ -239,8 +239,8 @@ public:
             if (!in) return std::nullopt;
             if (in->kind == Input::Kind::character) {
                 // Alt with a character: the key of that character, with Alt held.
-                const mini::Keystroke k = next < 128 ? mini::keystroke_for_char(static_cast<uint8_t>(next))
-                                                     : mini::Keystroke{};
+                const model::Keystroke k = next < 128 ? model::keystroke_for_char(static_cast<uint8_t>(next))
+                                                     : model::Keystroke{};
                 return Input::key_of(k.key_code, static_cast<int16_t>(k.shift | kAltMask));
             }
             in->shift = static_cast<int16_t>(in->shift | kAltMask);

@@ -62,7 +62,7 @@ public:
     // never by a scan, so that loading, saving and each keystroke stay linear in the form.
     std::unordered_map<std::string, MiniSite*> by_name_;  // name_key -> site
     MiniSite* focused_ = nullptr;
-    std::deque<SentKey> queue_;
+    std::deque<model::SentKey> queue_;
     bool delivering_ = false;
     int handler_depth_ = 0;
 };
@@ -112,10 +112,10 @@ MiniSite& FormImpl::add(const ClassInfo& cls, std::string name, float width, flo
 }
 
 void FormImpl::queue_keys(HostedControl& from, std::string_view keys) {
-    std::vector<SentKey> parsed;
+    std::vector<model::SentKey> parsed;
     try {
-        parsed = parse_send_keys(keys);
-    } catch (const SendKeysError&) {
+        parsed = model::parse_send_keys(keys);
+    } catch (const model::SendKeysError&) {
         raise_error(kInvalidProcedureCall);  // as the platform's send keys does
     }
     if (observer_) observer_->keys_sent(from, keys);
@@ -212,18 +212,18 @@ void FormImpl::run_pending() {
     } done{delivering_};
     std::size_t delivered = 0;
     while (!queue_.empty()) {
-        SentKey k = queue_.front();
+        model::SentKey k = queue_.front();
         queue_.pop_front();
         if (!focused_) continue;  // nobody to take it: dropped
         if (++delivered > kMaxSentKeys) {
             queue_.clear();
-            if (observer_) observer_->handler_error(focused_->name() + ".surface.SendKeys", kOutOfStackSpace);
+            if (observer_) observer_->handler_error(focused_->name() + ".surface.SendKeys", model::kOutOfStackSpace);
             break;
         }
         switch (k.kind) {
-        case SentKey::tab: tab(true); break;
-        case SentKey::back_tab: tab(false); break;
-        case SentKey::keystroke: keystroke(k.key); break;
+        case model::SentKey::tab: tab(true); break;
+        case model::SentKey::back_tab: tab(false); break;
+        case model::SentKey::keystroke: keystroke(k.key); break;
         }
     }
 }
@@ -325,7 +325,7 @@ void Form::keystroke(const Keystroke& k) {
 }
 
 void Form::type(std::string_view text) {
-    for (char c : text) keystroke(keystroke_for_char(static_cast<uint8_t>(c)));
+    for (char c : text) keystroke(model::keystroke_for_char(static_cast<uint8_t>(c)));
 }
 
 void Form::key_down(int16_t key_code, int16_t shift) {

@@ -17,10 +17,14 @@
 #include "keltext/host/container.h"
 #include "keltext/host/members.h"
 #include "keltext/host/variant.h"
-#include "keltext/minihost/keyboard.h"
-#include "keltext/minihost/part.h"
+#include "keltext/widgetmodel/keyboard.h"
+#include "keltext/widgetmodel/part.h"
 
 namespace kel::mini {
+
+// The form hands out the models' parts and takes their keystrokes.
+using model::Keystroke;
+using model::Part;
 
 class HostedControl;
 class FormImpl;

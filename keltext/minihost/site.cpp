@@ -2,10 +2,10 @@
 
 #include "keltext/host/conversions.h"
 #include "keltext/host/errors.h"
-#include "keltext/minihost/buttons.h"
-#include "keltext/minihost/edit_box.h"
-#include "keltext/minihost/list_widgets.h"
-#include "keltext/minihost/masked_edit.h"
+#include "keltext/widgetmodel/buttons.h"
+#include "keltext/widgetmodel/edit_box.h"
+#include "keltext/widgetmodel/list_widgets.h"
+#include "keltext/widgetmodel/masked_edit.h"
 
 namespace kel::mini {
 namespace {
@@ -41,13 +41,13 @@ Dispatch& PagePart::selected_control(std::size_t i) {
 }
 
 Variant PagePart::peek(std::string_view member, std::optional<int32_t> index) const {
-    no_index(index);
+    model::no_index(index);
     if (same_name(member, "Changed")) return changed_;
     raise_error(kNoSuchMember);
 }
 
 void PagePart::poke(std::string_view member, const Variant& value, std::optional<int32_t> index) {
-    no_index(index);
+    model::no_index(index);
     if (same_name(member, "Changed")) return Changed(to_bool(value));
     raise_error(kNoSuchMember);
 }
@@ -95,7 +95,7 @@ void MiniSite::raise_event(int number, std::string_view name, std::span<EventArg
     // The form's code may set properties that raise events again: without end, the chain is
     // cut as deep nesting of widget handlers is.
     try {
-        if (!enter_handler()) throw HandlerOverflow{};
+        if (!enter_handler()) throw model::HandlerOverflow{};
         struct Leave {
             MiniSite& site;
             ~Leave() { site.leave_handler(); }
@@ -106,7 +106,7 @@ void MiniSite::raise_event(int number, std::string_view name, std::span<EventArg
         o->event_raised(*this, number, name, args);
         for (std::size_t i = 0; i < args.size(); ++i)
             if (!(args[i].value == given[i])) args[i].value = coerce_like(args[i].value, given[i]);
-    } catch (HandlerOverflow& overflow) {
+    } catch (model::HandlerOverflow& overflow) {
         // Only the outermost handler reports; an event raised by the form's driver itself (not
         // from a widget's notification) is the control's own, on its surface.
         if (handlers_running()) throw;
@@ -119,7 +119,7 @@ void MiniSite::handler_error(std::string_view part, std::string_view notificatio
 }
 
 void MiniSite::handler_overflow(std::string_view where) {
-    if (auto* o = form_.observer()) o->handler_error(where, kOutOfStackSpace);
+    if (auto* o = form_.observer()) o->handler_error(where, model::kOutOfStackSpace);
 }
 
 std::string MiniSite::handler_where(std::string_view part, std::string_view notification) const {
@@ -141,16 +141,16 @@ W& MiniSite::add_part(std::string_view name) {
     return ref;
 }
 
-EditBox& MiniSite::create_edit_box(std::string_view name) { return add_part<MiniEditBox>(name); }
-ComboBox& MiniSite::create_combo_box(std::string_view name) { return add_part<MiniComboBox>(name); }
-MaskedEdit& MiniSite::create_masked_edit(std::string_view name) { return add_part<MiniMaskedEdit>(name); }
-SpinButton& MiniSite::create_spin_button(std::string_view name) { return add_part<MiniSpinButton>(name); }
-Image& MiniSite::create_image(std::string_view name) { return add_part<MiniImage>(name); }
-ListBox& MiniSite::create_list_box(std::string_view name) { return add_part<MiniListBox>(name); }
-CheckBox& MiniSite::create_check_box(std::string_view name) { return add_part<MiniCheckBox>(name); }
-PushButton& MiniSite::create_push_button(std::string_view name) { return add_part<MiniPushButton>(name); }
-Label& MiniSite::create_label(std::string_view name) { return add_part<MiniLabel>(name); }
-Frame& MiniSite::create_frame(std::string_view name) { return add_part<MiniFrame>(name); }
+EditBox& MiniSite::create_edit_box(std::string_view name) { return add_part<model::EditBoxModel>(name); }
+ComboBox& MiniSite::create_combo_box(std::string_view name) { return add_part<model::ComboBoxModel>(name); }
+MaskedEdit& MiniSite::create_masked_edit(std::string_view name) { return add_part<model::MaskedEditModel>(name); }
+SpinButton& MiniSite::create_spin_button(std::string_view name) { return add_part<model::SpinButtonModel>(name); }
+Image& MiniSite::create_image(std::string_view name) { return add_part<model::ImageModel>(name); }
+ListBox& MiniSite::create_list_box(std::string_view name) { return add_part<model::ListBoxModel>(name); }
+CheckBox& MiniSite::create_check_box(std::string_view name) { return add_part<model::CheckBoxModel>(name); }
+PushButton& MiniSite::create_push_button(std::string_view name) { return add_part<model::PushButtonModel>(name); }
+Label& MiniSite::create_label(std::string_view name) { return add_part<model::LabelModel>(name); }
+Frame& MiniSite::create_frame(std::string_view name) { return add_part<model::FrameModel>(name); }
 
 Part* MiniSite::part(std::string_view name) {
     if (same_name(name, "surface")) return &surface_;

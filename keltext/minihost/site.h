@@ -10,10 +10,14 @@
 #include "keltext/host/container.h"
 #include "keltext/host/members.h"
 #include "keltext/minihost/form.h"
-#include "keltext/minihost/surface.h"
-#include "keltext/minihost/widget_base.h"
+#include "keltext/widgetmodel/surface.h"
+#include "keltext/widgetmodel/widget_base.h"
 
 namespace kel::mini {
+
+using model::InputPart;
+using model::SurfaceModel;
+using model::WidgetContext;
 
 // What a site needs of its form.
 class FormServices {
@@ -103,7 +107,7 @@ public:
     std::size_t place() const { return place_; }  // in creation order, from 0
     void set_place(std::size_t place) { place_ = place; }
     bool is_page() const { return page_ != nullptr; }
-    MiniSurface& mini_surface() { return surface_; }
+    SurfaceModel& mini_surface() { return surface_; }
     PagePart* page_part() { return page_.get(); }
     InputPart* keyboard_input() { return keyboard_part_; }
     // The constituent `p` is, or null when it is not one of this control's.
@@ -129,7 +133,7 @@ private:
     FormServices& form_;
     const ClassInfo& info_;
     std::string name_;
-    MiniSurface surface_;
+    SurfaceModel surface_;
     std::unique_ptr<PagePart> page_;
     std::vector<std::pair<std::string, std::unique_ptr<InputPart>>> parts_;
     InputPart* keyboard_part_ = nullptr;

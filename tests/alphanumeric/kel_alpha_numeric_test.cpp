@@ -12,7 +12,7 @@
 #include "keltext/host/errors.h"
 #include "keltext/host/font.h"
 #include "keltext/minihost/form.h"
-#include "keltext/minihost/keyboard.h"
+#include "keltext/widgetmodel/keyboard.h"
 #include "tests/support/form_recorder.h"
 
 namespace kel {
@@ -35,9 +35,9 @@ protected:
         return h.part(part)->peek(member);
     }
     void type(std::string_view text) {
-        for (char c : text) form.keystroke(mini::keystroke_for_char(static_cast<uint8_t>(c)));
+        for (char c : text) form.keystroke(model::keystroke_for_char(static_cast<uint8_t>(c)));
     }
-    void key(std::string_view name) { form.keystroke(*mini::parse_key(name)); }
+    void key(std::string_view name) { form.keystroke(*model::parse_key(name)); }
     std::string text(HostedControl& h) { return get(h, "Text").str(); }
     int32_t caret(HostedControl& h) { return *peek(h, "TxtCustom", "SelStart").get_if<int32_t>(); }
 

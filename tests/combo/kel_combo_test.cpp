@@ -14,7 +14,7 @@
 #include "keltext/host/errors.h"
 #include "keltext/host/font.h"
 #include "keltext/minihost/form.h"
-#include "keltext/minihost/keyboard.h"
+#include "keltext/widgetmodel/keyboard.h"
 #include "tests/combo/fake_list.h"
 #include "tests/support/form_recorder.h"
 
@@ -48,9 +48,9 @@ protected:
     Variant peek(HostedControl& h, std::string_view member) { return h.part("cboCustom")->peek(member); }
     void poke(HostedControl& h, std::string_view member, const Variant& v) { h.part("cboCustom")->poke(member, v); }
     void type(std::string_view text) {
-        for (char c : text) form.keystroke(mini::keystroke_for_char(static_cast<uint8_t>(c)));
+        for (char c : text) form.keystroke(model::keystroke_for_char(static_cast<uint8_t>(c)));
     }
-    void key(std::string_view name) { form.keystroke(*mini::parse_key(name)); }
+    void key(std::string_view name) { form.keystroke(*model::parse_key(name)); }
     std::string text(HostedControl& h) { return peek(h, "Text").str(); }
     int error_of(const std::function<void()>& f) {
         try {

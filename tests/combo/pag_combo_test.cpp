@@ -41,7 +41,7 @@ protected:
     void click(HostedControl& pg, std::string_view part) { form.click(pg, *pg.part(part)); }
     Entries entries(HostedControl& pg) {
         Entries out;
-        mini::Part& lst = *pg.part("lstList");
+        model::Part& lst = *pg.part("lstList");
         const int32_t n = *lst.peek("ListCount").get_if<int32_t>();
         for (int32_t i = 0; i < n; ++i)
             out.emplace_back(lst.peek("List", i).str(), *lst.peek("ItemData", i).get_if<int32_t>());

@@ -10,7 +10,7 @@
 
 #include "keltext/datemask/class_info.h"
 #include "keltext/minihost/form.h"
-#include "keltext/minihost/keyboard.h"
+#include "keltext/widgetmodel/keyboard.h"
 #include "tests/support/form_recorder.h"
 
 namespace kel {
@@ -86,7 +86,7 @@ TEST_F(DateMaskTest, ExitOutcomes) {
             if (ev == "DateError") alf_in_handler = d.AllowLostFocus();
         };
         f.focus(&h);
-        for (char ch : std::string_view(c.typed)) f.keystroke(mini::keystroke_for_char(static_cast<uint8_t>(ch)));
+        for (char ch : std::string_view(c.typed)) f.keystroke(model::keystroke_for_char(static_cast<uint8_t>(ch)));
         f.focus(nullptr);
         const std::string what = std::string(c.typed) + " Z=" + std::to_string(c.zub) + " T=" +
                                  std::to_string(c.trigger) + " B=" + std::to_string(c.blank);

@@ -14,7 +14,7 @@
 #include "apps/kelform/script_syntax.h"
 #include "keltext/host/font.h"
 #include "keltext/library/catalogue.h"
-#include "keltext/minihost/keyboard.h"
+#include "keltext/widgetmodel/keyboard.h"
 
 namespace kel::kelform {
 namespace {
@@ -74,7 +74,7 @@ TEST_F(FormFileTest, SavedValuesComeBackAfterReopening) {
     open_form(form, loaded, classes(), "voucher.kform", day(2026, 12, 6));
     // A person types into the payee box; the alphanumeric box stores its text.
     form.focus(form.find("Payee"));
-    for (char c : std::string("jos\xE9 \"q\" \\ x")) form.keystroke(mini::keystroke_for_char(static_cast<uint8_t>(c)));
+    for (char c : std::string("jos\xE9 \"q\" \\ x")) form.keystroke(model::keystroke_for_char(static_cast<uint8_t>(c)));
     form.find("PayMode")->dispatch().set("FillList", Variant("A\xC9" "1\xC8" "B\xC9-7\xC8"));
     const Variant typed = form.find("Payee")->dispatch().get("Text");
     ASSERT_EQ(typed.str().size(), 12u);

@@ -8,7 +8,7 @@
 #include "apps/kelform/form_file.h"
 #include "apps/kelform/terminal_session.h"
 #include "keltext/library/catalogue.h"
-#include "keltext/minihost/keyboard.h"
+#include "keltext/widgetmodel/keyboard.h"
 
 namespace kel::kelform {
 namespace {

@@ -223,13 +223,13 @@ TEST(Form, FocusOrderAndTabbing) {
         f.tab(s.forward);
         EXPECT_EQ(f.focused(), s.expected);
     }
-    f.keystroke(*parse_key("Shift+Tab"));
+    f.keystroke(*model::parse_key("Shift+Tab"));
     EXPECT_EQ(f.focused(), &a);
     r.take();
     f.focus(nullptr);
     EXPECT_EQ(r.take(), (Lines{"a.LostFocus", "a.ExitFocus"}));
     EXPECT_EQ(f.focused(), nullptr);
-    EXPECT_THROW(f.keystroke(*parse_key("a")), FormError);
+    EXPECT_THROW(f.keystroke(*model::parse_key("a")), FormError);
     f.tab(false);  // from nothing, backwards: the last control that can take focus
     EXPECT_EQ(f.focused(), &b);
 }
@@ -249,7 +249,7 @@ TEST(Form, KeystrokeOrderAndHandlersChangingArguments) {
         if (k == 'y') args[0].value = int32_t{'Z'};
         if (k == 'q') args[0].value = "not a number";
     };
-    for (char ch : std::string("xyq")) f.keystroke(keystroke_for_char(static_cast<uint8_t>(ch)));
+    for (char ch : std::string("xyq")) f.keystroke(model::keystroke_for_char(static_cast<uint8_t>(ch)));
     EXPECT_EQ(probe(a).txt().Text(), "Zq");
     Lines log = r.take();
     EXPECT_EQ(log[0], "a.KeyDown KeyCode=88 Shift=0");
@@ -260,10 +260,10 @@ TEST(Form, KeystrokeOrderAndHandlersChangingArguments) {
 
     // A disabled surface or widget takes no keystrokes.
     probe(a).txt().Enabled(false);
-    f.keystroke(keystroke_for_char('k'));
+    f.keystroke(model::keystroke_for_char('k'));
     probe(a).txt().Enabled(true);
     probe(a).site().surface().Enabled(false);
-    f.keystroke(keystroke_for_char('k'));
+    f.keystroke(model::keystroke_for_char('k'));
     EXPECT_TRUE(r.take().empty());
     EXPECT_EQ(probe(a).txt().Text(), "Zq");
 }
@@ -282,7 +282,7 @@ TEST(Form, SentKeysComeAfterTheCallInOrder) {
         }
     };
     probe(a).txt().Text("ab");
-    f.keystroke(keystroke_for_char('/'));
+    f.keystroke(model::keystroke_for_char('/'));
     EXPECT_EQ(probe(a).txt().Text(), "1ab");
     EXPECT_EQ(probe(b).txt().Text(), "2");
     EXPECT_EQ(f.focused(), &b);
@@ -310,12 +310,12 @@ TEST(Form, EndlessSentKeysAreStopped) {
     r.hook = [&](HostedControl& c, std::string_view event, std::span<EventArg>) {
         if (event == "KeyUp") probe(c).site().keyboard().send_keys("{END}");
     };
-    f.keystroke(*parse_key("Home"));
+    f.keystroke(*model::parse_key("Home"));
     Lines log = r.take();
     ASSERT_FALSE(log.empty());
     EXPECT_EQ(log.back(), "a.surface.SendKeys -> error 28");
     r.hook = nullptr;
-    f.keystroke(keystroke_for_char('k'));  // the form still works
+    f.keystroke(model::keystroke_for_char('k'));  // the form still works
     EXPECT_EQ(probe(a).txt().Text(), "k");
 }
 
@@ -356,7 +356,7 @@ TEST(Form, HandlersThatNotifyEachOtherWithoutEndUnwindOnce) {
         r.hook = nullptr;
         f.focus(&a);
         std::size_t length = probe(a).txt().Text().size();
-        f.keystroke(keystroke_for_char('k'));  // the form still works
+        f.keystroke(model::keystroke_for_char('k'));  // the form still works
         EXPECT_EQ(probe(a).txt().Text().size(), length + 1);
     }
 }
@@ -373,7 +373,7 @@ TEST(Form, HandlerErrorsAreReportedWhereTheyHappen) {
     r.take();
     f.click(a, *a.part("cmdGo"));
     f.focus(&b);
-    f.keystroke(keystroke_for_char('k'));
+    f.keystroke(model::keystroke_for_char('k'));
     Lines log = r.take();
     auto has = [&](const std::string& s) { return std::find(log.begin(), log.end(), s) != log.end(); };
     EXPECT_TRUE(has("a.cmdGo.Click -> error 13"));

@@ -76,7 +76,7 @@ TEST_F(NumericTest, TextReadsThroughTheGrouping) {
 
 TEST_F(NumericTest, ClicksReachTheFormOnlyWhenEnabledAndNotLocked) {
     HostedControl& n = add();
-    mini::Part& box = *n.part("txtNumeric");
+    model::Part& box = *n.part("txtNumeric");
     form.click(n, box);
     form.dbl_click(n, box);
     EXPECT_EQ(rec.count("Click") + rec.count("DblClick"), 2);

@@ -6,14 +6,14 @@
 #include <string>
 #include <string_view>
 
-#include "keltext/minihost/keyboard.h"
-#include "keltext/minihost/widget_base.h"
+#include "keltext/widgetmodel/keyboard.h"
+#include "keltext/widgetmodel/widget_base.h"
 
-namespace kel::mini {
+namespace kel::model {
 
 template <class Iface>
-class EditFieldImpl : public TextWidgetImpl<Iface> {
-    using Base = TextWidgetImpl<Iface>;
+class EditFieldModel : public TextWidgetModel<Iface> {
+    using Base = TextWidgetModel<Iface>;
 
 public:
     using Base::Base;
@@ -176,4 +176,4 @@ protected:
     int32_t sel_length_ = 0;
 };
 
-}  // namespace kel::mini
+}  // namespace kel::model

@@ -6,9 +6,9 @@
 #include <string_view>
 #include <vector>
 
-#include "keltext/minihost/edit_field.h"
+#include "keltext/widgetmodel/edit_field.h"
 
-namespace kel::mini {
+namespace kel::model {
 
 // Entries with item data, the selected entry and the one added last. Index errors are 381.
 class ListCore {
@@ -42,9 +42,9 @@ private:
     std::vector<Entry> entries_;
 };
 
-class MiniComboBox final : public EditFieldImpl<ComboBox> {
+class ComboBoxModel final : public EditFieldModel<ComboBox> {
 public:
-    using EditFieldImpl<ComboBox>::EditFieldImpl;
+    using EditFieldModel<ComboBox>::EditFieldModel;
 
     std::string_view widget_type() const override { return "ComboBox"; }
     std::vector<std::string> notifications() const override;
@@ -85,9 +85,9 @@ private:
     bool sorted_ = false;
 };
 
-class MiniListBox final : public WidgetImpl<ListBox> {
+class ListBoxModel final : public WidgetModel<ListBox> {
 public:
-    using WidgetImpl<ListBox>::WidgetImpl;
+    using WidgetModel<ListBox>::WidgetModel;
 
     std::string_view widget_type() const override { return "ListBox"; }
     std::vector<std::string> notifications() const override { return {"Click", "GotFocus", "Scroll"}; }
@@ -116,4 +116,4 @@ private:
     ListCore list_;
 };
 
-}  // namespace kel::mini
+}  // namespace kel::model

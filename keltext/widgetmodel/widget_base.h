@@ -15,9 +15,9 @@
 #include "keltext/host/errors.h"
 #include "keltext/host/font.h"
 #include "keltext/host/widgets.h"
-#include "keltext/minihost/part.h"
+#include "keltext/widgetmodel/part.h"
 
-namespace kel::mini {
+namespace kel::model {
 
 // Error number for a write to a member that can only be read.
 inline constexpr int kReadOnlyProperty = 383;
@@ -118,9 +118,9 @@ inline float checked_position(float v) {
 
 // Base of every minimal-host widget: `Iface` is the host widget interface it implements.
 template <class Iface>
-class WidgetImpl : public Iface, public InputPart {
+class WidgetModel : public Iface, public InputPart {
 public:
-    WidgetImpl(WidgetContext& context, std::string name, int32_t handle, float width, float height)
+    WidgetModel(WidgetContext& context, std::string name, int32_t handle, float width, float height)
         : context_(context), name_(std::move(name)), handle_(handle), width_(width), height_(height) {}
 
     // Widget
@@ -245,8 +245,8 @@ protected:
 
 // A widget that shows text: colours and a shared font.
 template <class Iface>
-class TextWidgetImpl : public WidgetImpl<Iface> {
-    using Base = WidgetImpl<Iface>;
+class TextWidgetModel : public WidgetModel<Iface> {
+    using Base = WidgetModel<Iface>;
 
 public:
     using Base::Base;
@@ -291,4 +291,4 @@ protected:
     std::shared_ptr<kel::Font> font_ = default_font();
 };
 
-}  // namespace kel::mini
+}  // namespace kel::model

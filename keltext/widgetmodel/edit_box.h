@@ -1,12 +1,12 @@
 #pragma once
 // The minimal host's single-line edit box.
-#include "keltext/minihost/edit_field.h"
+#include "keltext/widgetmodel/edit_field.h"
 
-namespace kel::mini {
+namespace kel::model {
 
-class MiniEditBox final : public EditFieldImpl<EditBox> {
+class EditBoxModel final : public EditFieldModel<EditBox> {
 public:
-    using EditFieldImpl<EditBox>::EditFieldImpl;
+    using EditFieldModel<EditBox>::EditFieldModel;
 
     std::string_view widget_type() const override { return "EditBox"; }
     std::vector<std::string> notifications() const override;
@@ -24,4 +24,4 @@ private:
     int32_t max_length_ = 0;
 };
 
-}  // namespace kel::mini
+}  // namespace kel::model

@@ -9,7 +9,7 @@
 
 #include "keltext/host/variant.h"
 
-namespace kel::mini {
+namespace kel::model {
 
 class Part {
 public:
@@ -31,4 +31,4 @@ public:
 std::optional<std::string> find_member(const Part& part, std::string_view name);
 std::optional<std::string> find_notification(const Part& part, std::string_view name);
 
-}  // namespace kel::mini
+}  // namespace kel::model

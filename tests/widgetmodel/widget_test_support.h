@@ -4,9 +4,9 @@
 #include <string_view>
 #include <vector>
 
-#include "keltext/minihost/widget_base.h"
+#include "keltext/widgetmodel/widget_base.h"
 
-namespace kel::mini::testing_support {
+namespace kel::model::testing_support {
 
 struct RecordingContext : WidgetContext {
     std::vector<std::string> errors;
@@ -35,4 +35,4 @@ inline void act(InputPart& w, std::string_view action) {
     }
 }
 
-}  // namespace kel::mini::testing_support
+}  // namespace kel::model::testing_support

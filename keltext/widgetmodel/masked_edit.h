@@ -15,13 +15,13 @@
 #include <string>
 
 #include "keltext/host/mask.h"
-#include "keltext/minihost/edit_field.h"
+#include "keltext/widgetmodel/edit_field.h"
 
-namespace kel::mini {
+namespace kel::model {
 
-class MiniMaskedEdit final : public EditFieldImpl<MaskedEdit> {
+class MaskedEditModel final : public EditFieldModel<MaskedEdit> {
 public:
-    using EditFieldImpl<MaskedEdit>::EditFieldImpl;
+    using EditFieldModel<MaskedEdit>::EditFieldModel;
 
     static constexpr char kPrompt = kMaskPrompt;
     static bool is_input(char mask_char);
@@ -30,7 +30,7 @@ public:
     std::string_view widget_type() const override { return "MaskedEdit"; }
     std::vector<std::string> notifications() const override;
 
-    using EditFieldImpl<MaskedEdit>::Text;
+    using EditFieldModel<MaskedEdit>::Text;
     void Text(const std::string& t) override;
     std::string Mask() const override { return mask_; }
     // Lays the current text into the new mask position by position (literals from the mask,
@@ -60,4 +60,4 @@ private:
     std::string mask_;
 };
 
-}  // namespace kel::mini
+}  // namespace kel::model

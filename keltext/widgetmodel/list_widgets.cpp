@@ -1,10 +1,10 @@
-#include "keltext/minihost/list_widgets.h"
+#include "keltext/widgetmodel/list_widgets.h"
 
 #include <algorithm>
 
 #include "keltext/host/charset.h"
 
-namespace kel::mini {
+namespace kel::model {
 namespace {
 
 // Ordinal order of the upper-cased texts, without building them.
@@ -123,13 +123,13 @@ void ListCore::sort() {
 
 // ---- combo box
 
-std::vector<std::string> MiniComboBox::notifications() const {
+std::vector<std::string> ComboBoxModel::notifications() const {
     return {"Change", "Click", "DblClick", "DropDown", "GotFocus", "KeyDown", "KeyPress", "KeyUp", "Scroll"};
 }
 
-void MiniComboBox::AddItem(const std::string& item, std::optional<int32_t> index) { list_.add(item, index, sorted_); }
+void ComboBoxModel::AddItem(const std::string& item, std::optional<int32_t> index) { list_.add(item, index, sorted_); }
 
-void MiniComboBox::ListIndex(int32_t index) {
+void ComboBoxModel::ListIndex(int32_t index) {
     list_.check_selectable(index);
     list_.list_index = index;
     if (index < 0) return;
@@ -139,17 +139,17 @@ void MiniComboBox::ListIndex(int32_t index) {
     fire_click();
 }
 
-void MiniComboBox::Style(int16_t v) {
+void ComboBoxModel::Style(int16_t v) {
     if (v < 0 || v > 2) raise_error(kInvalidPropertyValue);
     style_ = v;
 }
 
-void MiniComboBox::Sorted(bool v) {
+void ComboBoxModel::Sorted(bool v) {
     if (v && !sorted_) list_.sort();
     sorted_ = v;
 }
 
-void MiniComboBox::own_key_down(int16_t key_code, int16_t shift) {
+void ComboBoxModel::own_key_down(int16_t key_code, int16_t shift) {
     // Up and Down step through the list, stopping at its ends.
     if (key_code == kVkUp) {
         if (list_.list_index > 0) ListIndex(list_.list_index - 1);
@@ -159,50 +159,50 @@ void MiniComboBox::own_key_down(int16_t key_code, int16_t shift) {
         if (list_.list_index + 1 < list_.count()) ListIndex(list_.list_index + 1);
         return;
     }
-    EditFieldImpl::own_key_down(key_code, shift);
+    EditFieldModel::own_key_down(key_code, shift);
 }
 
-void MiniComboBox::list_members(std::vector<std::string>& m) const {
-    EditFieldImpl::list_members(m);
+void ComboBoxModel::list_members(std::vector<std::string>& m) const {
+    EditFieldModel::list_members(m);
     list_member_names(m);
     m.insert(m.end(), {"Style", "Sorted"});
 }
 
-std::optional<Variant> MiniComboBox::peek_member(std::string_view m, std::optional<int32_t> index) const {
+std::optional<Variant> ComboBoxModel::peek_member(std::string_view m, std::optional<int32_t> index) const {
     if (auto v = peek_list(*this, m, index)) return v;
     if (same_name(m, "Style")) return Variant(style_);
     if (same_name(m, "Sorted")) return Variant(sorted_);
-    return EditFieldImpl::peek_member(m, index);
+    return EditFieldModel::peek_member(m, index);
 }
 
-bool MiniComboBox::poke_member(std::string_view m, const Variant& v, std::optional<int32_t> index) {
+bool ComboBoxModel::poke_member(std::string_view m, const Variant& v, std::optional<int32_t> index) {
     if (poke_list(*this, m, v, index)) return true;
     if (same_name(m, "Style")) { Style(to_int16(v)); return true; }
     if (same_name(m, "Sorted")) { Sorted(to_bool(v)); return true; }
-    return EditFieldImpl::poke_member(m, v, index);
+    return EditFieldModel::poke_member(m, v, index);
 }
 
 // ---- list box
 
-void MiniListBox::ListIndex(int32_t index) {
+void ListBoxModel::ListIndex(int32_t index) {
     list_.check_selectable(index);
     list_.list_index = index;
     if (index >= 0) fire_click();
 }
 
-void MiniListBox::list_members(std::vector<std::string>& m) const {
-    WidgetImpl::list_members(m);
+void ListBoxModel::list_members(std::vector<std::string>& m) const {
+    WidgetModel::list_members(m);
     list_member_names(m);
 }
 
-std::optional<Variant> MiniListBox::peek_member(std::string_view m, std::optional<int32_t> index) const {
+std::optional<Variant> ListBoxModel::peek_member(std::string_view m, std::optional<int32_t> index) const {
     if (auto v = peek_list(*this, m, index)) return v;
-    return WidgetImpl::peek_member(m, index);
+    return WidgetModel::peek_member(m, index);
 }
 
-bool MiniListBox::poke_member(std::string_view m, const Variant& v, std::optional<int32_t> index) {
+bool ListBoxModel::poke_member(std::string_view m, const Variant& v, std::optional<int32_t> index) {
     if (poke_list(*this, m, v, index)) return true;
-    return WidgetImpl::poke_member(m, v, index);
+    return WidgetModel::poke_member(m, v, index);
 }
 
-}  // namespace kel::mini
+}  // namespace kel::model

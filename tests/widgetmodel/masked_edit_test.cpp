@@ -1,10 +1,10 @@
-#include "keltext/minihost/masked_edit.h"
+#include "keltext/widgetmodel/masked_edit.h"
 
 #include <gtest/gtest.h>
 
-#include "tests/minihost/widget_test_support.h"
+#include "tests/widgetmodel/widget_test_support.h"
 
-namespace kel::mini {
+namespace kel::model {
 namespace {
 
 using testing_support::act;
@@ -54,7 +54,7 @@ TEST(MaskedEdit, TypingAndDeleting) {
     for (const auto& c : cases) {
         SCOPED_TRACE(c.what);
         RecordingContext ctx;
-        MiniMaskedEdit box(ctx, "msk", 1, 1200, 300);
+        MaskedEditModel box(ctx, "msk", 1, 1200, 300);
         box.Mask("");
         box.Text(c.text);
         box.Mask(c.mask);
@@ -88,7 +88,7 @@ TEST(MaskedEdit, SettingTheMaskLaysTheTextIn) {
     for (const auto& c : cases) {
         SCOPED_TRACE(testing::Message() << '"' << c.text << "\" into \"" << c.mask << '"');
         RecordingContext ctx;
-        MiniMaskedEdit box(ctx, "msk", 1, 1200, 300);
+        MaskedEditModel box(ctx, "msk", 1, 1200, 300);
         box.Text(c.text);
         int changes = 0;
         WidgetEvents ev;
@@ -103,7 +103,7 @@ TEST(MaskedEdit, SettingTheMaskLaysTheTextIn) {
 
 TEST(MaskedEdit, TextUnderAMaskMustBeOneTheMaskShows) {
     RecordingContext ctx;
-    MiniMaskedEdit box(ctx, "msk", 1, 1200, 300);
+    MaskedEditModel box(ctx, "msk", 1, 1200, 300);
     box.Mask("##/##/####");
     box.Text("12/05/2003");
     EXPECT_EQ(box.Text(), "12/05/2003");
@@ -126,4 +126,4 @@ TEST(MaskedEdit, TextUnderAMaskMustBeOneTheMaskShows) {
 }
 
 }  // namespace
-}  // namespace kel::mini
+}  // namespace kel::model

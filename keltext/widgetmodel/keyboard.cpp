@@ -1,11 +1,11 @@
-#include "keltext/minihost/keyboard.h"
+#include "keltext/widgetmodel/keyboard.h"
 
 #include <array>
 #include <utility>
 
 #include "keltext/host/conversions.h"
 
-namespace kel::mini {
+namespace kel::model {
 namespace {
 
 struct NamedKey {
@@ -268,4 +268,4 @@ std::vector<SentKey> parse_send_keys(std::string_view keys) {
     return out;
 }
 
-}  // namespace kel::mini
+}  // namespace kel::model

@@ -1,17 +1,17 @@
-#include "keltext/minihost/surface.h"
+#include "keltext/widgetmodel/surface.h"
 
 #include <cmath>
 
 #include "keltext/host/conversions.h"
 #include "keltext/host/errors.h"
-#include "keltext/minihost/widget_base.h"
+#include "keltext/widgetmodel/widget_base.h"
 
-namespace kel::mini {
+namespace kel::model {
 
-MiniSurface::MiniSurface(int32_t handle, float width, float height, std::function<void()> resize)
+SurfaceModel::SurfaceModel(int32_t handle, float width, float height, std::function<void()> resize)
     : handle_(handle), width_(checked_extent(width)), height_(checked_extent(height)), resize_(std::move(resize)) {}
 
-void MiniSurface::resized() {
+void SurfaceModel::resized() {
     if (!resize_ || resize_depth_ >= kMaxResizeDepth) return;
     ++resize_depth_;
     struct Leave {
@@ -21,21 +21,21 @@ void MiniSurface::resized() {
     resize_();
 }
 
-void MiniSurface::Width(float v) {
+void SurfaceModel::Width(float v) {
     checked_extent(v);
     if (v == width_) return;
     width_ = v;
     resized();
 }
 
-void MiniSurface::Height(float v) {
+void SurfaceModel::Height(float v) {
     checked_extent(v);
     if (v == height_) return;
     height_ = v;
     resized();
 }
 
-void MiniSurface::set_size(float width, float height) {
+void SurfaceModel::set_size(float width, float height) {
     checked_extent(width);
     checked_extent(height);
     if (width == width_ && height == height_) return;
@@ -44,21 +44,21 @@ void MiniSurface::set_size(float width, float height) {
     resized();
 }
 
-void MiniSurface::BorderStyle(int16_t v) {
+void SurfaceModel::BorderStyle(int16_t v) {
     if (v != 0 && v != 1) raise_error(kInvalidPropertyValue);
     border_ = v;
 }
 
-void MiniSurface::Font(std::shared_ptr<kel::Font> f) {
+void SurfaceModel::Font(std::shared_ptr<kel::Font> f) {
     if (!f) raise_error(kInvalidPropertyValue);
     font_ = std::move(f);
 }
 
-std::vector<std::string> MiniSurface::members() const {
+std::vector<std::string> SurfaceModel::members() const {
     return {"Width", "Height", "Enabled", "BackColor", "ForeColor", "BorderStyle", "Font", "hWnd", "RefreshCount"};
 }
 
-Variant MiniSurface::peek(std::string_view m, std::optional<int32_t> index) const {
+Variant SurfaceModel::peek(std::string_view m, std::optional<int32_t> index) const {
     no_index(index);
     if (same_name(m, "Width")) return width_;
     if (same_name(m, "Height")) return height_;
@@ -72,7 +72,7 @@ Variant MiniSurface::peek(std::string_view m, std::optional<int32_t> index) cons
     raise_error(kNoSuchMember);
 }
 
-void MiniSurface::poke(std::string_view m, const Variant& v, std::optional<int32_t> index) {
+void SurfaceModel::poke(std::string_view m, const Variant& v, std::optional<int32_t> index) {
     no_index(index);
     if (same_name(m, "Width")) return Width(to_single(v));
     if (same_name(m, "Height")) return Height(to_single(v));
@@ -89,4 +89,4 @@ void MiniSurface::poke(std::string_view m, const Variant& v, std::optional<int32
     raise_error(kNoSuchMember);
 }
 
-}  // namespace kel::mini
+}  // namespace kel::model

@@ -5,12 +5,12 @@
 
 #include <random>
 
-#include "keltext/minihost/edit_box.h"
-#include "keltext/minihost/list_widgets.h"
-#include "keltext/minihost/masked_edit.h"
-#include "tests/minihost/widget_test_support.h"
+#include "keltext/widgetmodel/edit_box.h"
+#include "keltext/widgetmodel/list_widgets.h"
+#include "keltext/widgetmodel/masked_edit.h"
+#include "tests/widgetmodel/widget_test_support.h"
 
-namespace kel::mini {
+namespace kel::model {
 namespace {
 
 using testing_support::RecordingContext;
@@ -48,7 +48,7 @@ TEST(Robustness, MaskedEditStaysConsistent) {
     for (unsigned seed = 1; seed <= 20; ++seed) {
         std::mt19937 rng(seed);
         RecordingContext ctx;
-        MiniMaskedEdit box(ctx, "msk", 1, 1200, 300);
+        MaskedEditModel box(ctx, "msk", 1, 1200, 300);
         for (int step = 0; step < 400; ++step) {
             if (rng() % 25 == 0) box.Mask(masks[rng() % std::size(masks)]);
             random_input(box, rng);
@@ -58,8 +58,8 @@ TEST(Robustness, MaskedEditStaysConsistent) {
                 for (std::size_t i = 0; i < box.Mask().size(); ++i) {
                     char m = box.Mask()[i];
                     char c = box.Text()[i];
-                    if (MiniMaskedEdit::is_input(m))
-                        ASSERT_TRUE(c == MiniMaskedEdit::kPrompt || MiniMaskedEdit::fits(c, m)) << box.Text();
+                    if (MaskedEditModel::is_input(m))
+                        ASSERT_TRUE(c == MaskedEditModel::kPrompt || MaskedEditModel::fits(c, m)) << box.Text();
                     else
                         ASSERT_EQ(c, m);
                 }
@@ -72,8 +72,8 @@ TEST(Robustness, EditBoxAndComboStayConsistent) {
     for (unsigned seed = 1; seed <= 20; ++seed) {
         std::mt19937 rng(seed);
         RecordingContext ctx;
-        MiniEditBox box(ctx, "txt", 1, 1200, 300);
-        MiniComboBox combo(ctx, "cbo", 2, 1200, 300);
+        EditBoxModel box(ctx, "txt", 1, 1200, 300);
+        ComboBoxModel combo(ctx, "cbo", 2, 1200, 300);
         box.MaxLength(static_cast<int32_t>(seed % 6));
         for (const char* s : {"one", "two", "three"}) combo.AddItem(s);
         for (int step = 0; step < 400; ++step) {
@@ -88,4 +88,4 @@ TEST(Robustness, EditBoxAndComboStayConsistent) {
 }
 
 }  // namespace
-}  // namespace kel::mini
+}  // namespace kel::model

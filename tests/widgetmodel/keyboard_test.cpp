@@ -1,11 +1,11 @@
-#include "keltext/minihost/keyboard.h"
+#include "keltext/widgetmodel/keyboard.h"
 
 #include <gtest/gtest.h>
 
 #include <optional>
 #include <string>
 
-namespace kel::mini {
+namespace kel::model {
 namespace {
 
 struct KeyCase {
@@ -116,4 +116,4 @@ TEST(ParseSendKeys, BadTextIsAClearError) {
 }
 
 }  // namespace
-}  // namespace kel::mini
+}  // namespace kel::model

@@ -1,10 +1,10 @@
-#include "keltext/minihost/edit_box.h"
+#include "keltext/widgetmodel/edit_box.h"
 
 #include <gtest/gtest.h>
 
-#include "tests/minihost/widget_test_support.h"
+#include "tests/widgetmodel/widget_test_support.h"
 
-namespace kel::mini {
+namespace kel::model {
 namespace {
 
 using testing_support::act;
@@ -50,7 +50,7 @@ TEST(EditBox, EditsByThePerson) {
     for (const auto& c : cases) {
         SCOPED_TRACE(c.what);
         RecordingContext ctx;
-        MiniEditBox box(ctx, "txt", 1, 1000, 300);
+        EditBoxModel box(ctx, "txt", 1, 1000, 300);
         box.Text(c.text);
         box.MaxLength(c.max_length);
         box.SelStart(c.sel_start);
@@ -69,7 +69,7 @@ TEST(EditBox, EditsByThePerson) {
 
 TEST(EditBox, HandlerSeesTheKeyFirstAndMayChangeOrDropIt) {
     RecordingContext ctx;
-    MiniEditBox box(ctx, "txt", 1, 1000, 300);
+    EditBoxModel box(ctx, "txt", 1, 1000, 300);
     std::vector<std::string> log;
     WidgetEvents ev;
     ev.key_press = [&](int16_t& k) {
@@ -91,7 +91,7 @@ TEST(EditBox, HandlerSeesTheKeyFirstAndMayChangeOrDropIt) {
 
 TEST(EditBox, ProgramSettersAndTheirErrors) {
     RecordingContext ctx;
-    MiniEditBox box(ctx, "txt", 1, 1000, 300);
+    EditBoxModel box(ctx, "txt", 1, 1000, 300);
     int changes = 0;
     WidgetEvents ev;
     ev.change = [&] { ++changes; };
@@ -141,7 +141,7 @@ TEST(EditBox, ProgramSettersAndTheirErrors) {
 
 TEST(EditBox, MembersByNameAndTheirErrors) {
     RecordingContext ctx;
-    MiniEditBox box(ctx, "txt", 77, 1000, 300);
+    EditBoxModel box(ctx, "txt", 77, 1000, 300);
     EXPECT_EQ(box.peek("hwnd"), Variant(int32_t{77}));
     EXPECT_EQ(font_of(box.peek("Font"))->name, "Fixedsys");
     EXPECT_EQ(*find_member(box, "selstart"), "SelStart");
@@ -167,7 +167,7 @@ TEST(EditBox, MembersByNameAndTheirErrors) {
 
 TEST(EditBox, HandlerErrorsAreReportedAndTheBoxGoesOn) {
     RecordingContext ctx;
-    MiniEditBox box(ctx, "txt", 1, 1000, 300);
+    EditBoxModel box(ctx, "txt", 1, 1000, 300);
     WidgetEvents ev;
     ev.key_press = [](int16_t&) { raise_error(kTypeMismatch); };
     ev.change = [] { raise_error(kOverflow); };
@@ -178,4 +178,4 @@ TEST(EditBox, HandlerErrorsAreReportedAndTheBoxGoesOn) {
 }
 
 }  // namespace
-}  // namespace kel::mini
+}  // namespace kel::model

@@ -1,17 +1,17 @@
-#include "keltext/minihost/masked_edit.h"
+#include "keltext/widgetmodel/masked_edit.h"
 
 #include "keltext/host/mask.h"
 
-namespace kel::mini {
-bool MiniMaskedEdit::is_input(char m) { return mask_is_input(m); }
+namespace kel::model {
+bool MaskedEditModel::is_input(char m) { return mask_is_input(m); }
 
-bool MiniMaskedEdit::fits(char ch, char m) { return mask_fits(ch, m); }
+bool MaskedEditModel::fits(char ch, char m) { return mask_fits(ch, m); }
 
-std::vector<std::string> MiniMaskedEdit::notifications() const {
+std::vector<std::string> MaskedEditModel::notifications() const {
     return {"KeyDown", "KeyPress", "KeyUp", "Change", "GotFocus", "LostFocus"};
 }
 
-void MiniMaskedEdit::Text(const std::string& t) {
+void MaskedEditModel::Text(const std::string& t) {
     if (!mask_.empty()) {
         bool shows = t.size() == mask_.size();
         for (std::size_t i = 0; shows && i < t.size(); ++i) {
@@ -20,10 +20,10 @@ void MiniMaskedEdit::Text(const std::string& t) {
         }
         if (!shows) raise_error(kInvalidPropertyValue);
     }
-    EditFieldImpl::Text(t);
+    EditFieldModel::Text(t);
 }
 
-void MiniMaskedEdit::Mask(const std::string& mask) {
+void MaskedEditModel::Mask(const std::string& mask) {
     mask_ = mask;
     if (mask_.empty()) return;  // a plain edit box keeps the text as it stands
     std::string laid(mask_.size(), kPrompt);
@@ -39,7 +39,7 @@ void MiniMaskedEdit::Mask(const std::string& mask) {
     sel_length_ = 0;
 }
 
-bool MiniMaskedEdit::put_char(char c) {
+bool MaskedEditModel::put_char(char c) {
     int32_t pos = sel_start_;
     while (pos < length() && !input_at(pos)) ++pos;
     if (pos >= length() || !fits(c, mask_[static_cast<std::size_t>(pos)])) return false;
@@ -51,7 +51,7 @@ bool MiniMaskedEdit::put_char(char c) {
     return true;
 }
 
-void MiniMaskedEdit::remove_at(int32_t pos) {
+void MaskedEditModel::remove_at(int32_t pos) {
     int32_t end = pos;
     while (end < length() && input_at(end)) ++end;
     // The rest of the field moves one place left, but only as far as each character fits the
@@ -66,32 +66,32 @@ void MiniMaskedEdit::remove_at(int32_t pos) {
     text_[static_cast<std::size_t>(i)] = kPrompt;
 }
 
-void MiniMaskedEdit::remove_selection() {
+void MaskedEditModel::remove_selection() {
     // From the end backwards, so that each removal leaves the positions before it in place.
     for (int32_t p = sel_start_ + sel_length_ - 1; p >= sel_start_; --p)
         if (input_at(p)) remove_at(p);
     sel_length_ = 0;
 }
 
-void MiniMaskedEdit::type_run(std::string_view text) {
+void MaskedEditModel::type_run(std::string_view text) {
     std::string before = text_;
     if (sel_length_ > 0) remove_selection();
     for (char c : text) put_char(c);
     if (text_ != before) fire_change();
 }
 
-void MiniMaskedEdit::user_paste(std::string_view text) {
-    if (mask_.empty()) return EditFieldImpl::user_paste(text);
+void MaskedEditModel::user_paste(std::string_view text) {
+    if (mask_.empty()) return EditFieldModel::user_paste(text);
     type_run(text);
 }
 
-void MiniMaskedEdit::set_sel_text(const std::string& t) {
-    if (mask_.empty()) return EditFieldImpl::set_sel_text(t);
+void MaskedEditModel::set_sel_text(const std::string& t) {
+    if (mask_.empty()) return EditFieldModel::set_sel_text(t);
     type_run(t);
 }
 
-void MiniMaskedEdit::own_key_down(int16_t key_code, int16_t shift) {
-    if (mask_.empty() || key_code != kVkDelete) return EditFieldImpl::own_key_down(key_code, shift);
+void MaskedEditModel::own_key_down(int16_t key_code, int16_t shift) {
+    if (mask_.empty() || key_code != kVkDelete) return EditFieldModel::own_key_down(key_code, shift);
     std::string before = text_;
     if (sel_length_ > 0) {
         remove_selection();
@@ -105,8 +105,8 @@ void MiniMaskedEdit::own_key_down(int16_t key_code, int16_t shift) {
     if (text_ != before) fire_change();
 }
 
-void MiniMaskedEdit::own_key_press(int16_t char_code) {
-    if (mask_.empty()) return EditFieldImpl::own_key_press(char_code);
+void MaskedEditModel::own_key_press(int16_t char_code) {
+    if (mask_.empty()) return EditFieldModel::own_key_press(char_code);
     std::string before = text_;
     if (char_code == kCharBackspace) {
         if (sel_length_ > 0) {
@@ -127,19 +127,19 @@ void MiniMaskedEdit::own_key_press(int16_t char_code) {
     if (text_ != before) fire_change();
 }
 
-void MiniMaskedEdit::list_members(std::vector<std::string>& m) const {
-    EditFieldImpl::list_members(m);
+void MaskedEditModel::list_members(std::vector<std::string>& m) const {
+    EditFieldModel::list_members(m);
     m.push_back("Mask");
 }
 
-std::optional<Variant> MiniMaskedEdit::peek_member(std::string_view m, std::optional<int32_t> index) const {
+std::optional<Variant> MaskedEditModel::peek_member(std::string_view m, std::optional<int32_t> index) const {
     if (same_name(m, "Mask")) return Variant(mask_);
-    return EditFieldImpl::peek_member(m, index);
+    return EditFieldModel::peek_member(m, index);
 }
 
-bool MiniMaskedEdit::poke_member(std::string_view m, const Variant& v, std::optional<int32_t> index) {
+bool MaskedEditModel::poke_member(std::string_view m, const Variant& v, std::optional<int32_t> index) {
     if (same_name(m, "Mask")) { Mask(text_of(v)); return true; }
-    return EditFieldImpl::poke_member(m, v, index);
+    return EditFieldModel::poke_member(m, v, index);
 }
 
-}  // namespace kel::mini
+}  // namespace kel::model

@@ -10,7 +10,7 @@
 
 #include "keltext/host/keys.h"
 
-namespace kel::mini {
+namespace kel::model {
 
 // One keystroke: key down and key up with key_code and shift, and a key press in between
 // when the key makes a character.
@@ -43,4 +43,4 @@ public:
 // An unknown {TOKEN} is a SendKeysError naming it.
 std::vector<SentKey> parse_send_keys(std::string_view keys);
 
-}  // namespace kel::mini
+}  // namespace kel::model

@@ -4,15 +4,15 @@
 #include <memory>
 
 #include "keltext/host/container.h"
-#include "keltext/minihost/part.h"
+#include "keltext/widgetmodel/part.h"
 
-namespace kel::mini {
+namespace kel::model {
 
-class MiniSurface final : public Surface, public Part {
+class SurfaceModel final : public Surface, public Part {
 public:
     // `resize` runs the control's Resize; it is called at once for every change of width or
     // height made after construction.
-    MiniSurface(int32_t handle, float width, float height, std::function<void()> resize);
+    SurfaceModel(int32_t handle, float width, float height, std::function<void()> resize);
 
     float Width() const override { return width_; }
     void Width(float v) override;
@@ -60,4 +60,4 @@ private:
     int32_t refresh_count_ = 0;
 };
 
-}  // namespace kel::mini
+}  // namespace kel::model

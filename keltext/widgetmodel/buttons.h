@@ -2,28 +2,28 @@
 // The minimal host's simpler widgets: spin buttons, image, check box, push button, label, frame.
 #include <string>
 
-#include "keltext/minihost/widget_base.h"
+#include "keltext/widgetmodel/widget_base.h"
 
-namespace kel::mini {
+namespace kel::model {
 
-class MiniSpinButton final : public WidgetImpl<SpinButton> {
+class SpinButtonModel final : public WidgetModel<SpinButton> {
 public:
-    using WidgetImpl<SpinButton>::WidgetImpl;
+    using WidgetModel<SpinButton>::WidgetModel;
     std::string_view widget_type() const override { return "SpinButton"; }
     std::vector<std::string> notifications() const override { return {"UpClick", "DownClick"}; }
 };
 
-class MiniImage final : public WidgetImpl<Image> {
+class ImageModel final : public WidgetModel<Image> {
 public:
-    using WidgetImpl<Image>::WidgetImpl;
+    using WidgetModel<Image>::WidgetModel;
     std::string_view widget_type() const override { return "Image"; }
     std::vector<std::string> notifications() const override { return {"Click"}; }
 };
 
 // Widgets whose member is a caption.
 template <class Iface>
-class CaptionImpl : public WidgetImpl<Iface> {
-    using Base = WidgetImpl<Iface>;
+class CaptionModel : public WidgetModel<Iface> {
+    using Base = WidgetModel<Iface>;
 
 public:
     using Base::Base;
@@ -48,9 +48,9 @@ protected:
     std::string caption_;
 };
 
-class MiniCheckBox final : public CaptionImpl<CheckBox> {
+class CheckBoxModel final : public CaptionModel<CheckBox> {
 public:
-    using CaptionImpl<CheckBox>::CaptionImpl;
+    using CaptionModel<CheckBox>::CaptionModel;
     std::string_view widget_type() const override { return "CheckBox"; }
     std::vector<std::string> notifications() const override { return {"Click"}; }
 
@@ -69,16 +69,16 @@ private:
     int16_t value_ = 0;
 };
 
-class MiniPushButton final : public CaptionImpl<PushButton> {
+class PushButtonModel final : public CaptionModel<PushButton> {
 public:
-    using CaptionImpl<PushButton>::CaptionImpl;
+    using CaptionModel<PushButton>::CaptionModel;
     std::string_view widget_type() const override { return "PushButton"; }
     std::vector<std::string> notifications() const override { return {"Click"}; }
 };
 
-class MiniLabel final : public CaptionImpl<Label> {
+class LabelModel final : public CaptionModel<Label> {
 public:
-    using CaptionImpl<Label>::CaptionImpl;
+    using CaptionModel<Label>::CaptionModel;
     std::string_view widget_type() const override { return "Label"; }
     std::vector<std::string> notifications() const override { return {"Click", "Change"}; }
 
@@ -86,11 +86,11 @@ protected:
     void set_caption(const std::string& c) override;  // a new caption raises Change
 };
 
-class MiniFrame final : public CaptionImpl<Frame> {
+class FrameModel final : public CaptionModel<Frame> {
 public:
-    using CaptionImpl<Frame>::CaptionImpl;
+    using CaptionModel<Frame>::CaptionModel;
     std::string_view widget_type() const override { return "Frame"; }
     std::vector<std::string> notifications() const override { return {"Click"}; }
 };
 
-}  // namespace kel::mini
+}  // namespace kel::model

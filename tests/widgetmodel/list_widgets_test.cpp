@@ -1,13 +1,13 @@
-#include "keltext/minihost/list_widgets.h"
+#include "keltext/widgetmodel/list_widgets.h"
 
 #include <gtest/gtest.h>
 
 #include <functional>
 
-#include "keltext/minihost/buttons.h"
-#include "tests/minihost/widget_test_support.h"
+#include "keltext/widgetmodel/buttons.h"
+#include "tests/widgetmodel/widget_test_support.h"
 
-namespace kel::mini {
+namespace kel::model {
 namespace {
 
 using testing_support::act;
@@ -21,7 +21,7 @@ std::vector<std::string> entries(const ListWidget& w) {
 
 TEST(ComboBox, SortedInsertionByUpperCasedText) {
     RecordingContext ctx;
-    MiniComboBox c(ctx, "cbo", 1, 1200, 300);
+    ComboBoxModel c(ctx, "cbo", 1, 1200, 300);
     c.Sorted(true);
     struct Step {
         const char* item;
@@ -40,7 +40,7 @@ TEST(ComboBox, SortedInsertionByUpperCasedText) {
 
 TEST(ComboBox, TurningSortedOnSortsAndKeepsTheSelection) {
     RecordingContext ctx;
-    MiniComboBox c(ctx, "cbo", 1, 1200, 300);
+    ComboBoxModel c(ctx, "cbo", 1, 1200, 300);
     for (const char* s : {"c", "a", "b"}) c.AddItem(s);
     c.ListIndex(0);
     c.poke("Sorted", true);
@@ -50,8 +50,8 @@ TEST(ComboBox, TurningSortedOnSortsAndKeepsTheSelection) {
 
 TEST(ListWidgets, IndexesOutOfRangeAre381) {
     RecordingContext ctx;
-    MiniComboBox combo(ctx, "cbo", 1, 1200, 300);
-    MiniListBox list(ctx, "lst", 2, 1200, 300);
+    ComboBoxModel combo(ctx, "cbo", 1, 1200, 300);
+    ListBoxModel list(ctx, "lst", 2, 1200, 300);
     for (ListWidget* w : std::initializer_list<ListWidget*>{&combo, &list}) {
         for (const char* s : {"a", "b", "c"}) w->AddItem(s);
         const std::function<void()> bad[] = {
@@ -80,7 +80,7 @@ TEST(ListWidgets, IndexesOutOfRangeAre381) {
 
 TEST(ComboBox, ListIndexPutsTheEntryInWithoutChangeAndRaisesClick) {
     RecordingContext ctx;
-    MiniComboBox c(ctx, "cbo", 1, 1200, 300);
+    ComboBoxModel c(ctx, "cbo", 1, 1200, 300);
     std::vector<std::string> log;
     WidgetEvents ev;
     ev.change = [&] { log.push_back("change"); };
@@ -122,7 +122,7 @@ TEST(ComboBox, ListIndexPutsTheEntryInWithoutChangeAndRaisesClick) {
 
 TEST(ComboBox, ListIndexFollowsTheEditText) {
     RecordingContext ctx;
-    MiniComboBox c(ctx, "cbo", 1, 1200, 300);
+    ComboBoxModel c(ctx, "cbo", 1, 1200, 300);
     std::vector<int32_t> seen_by_change;
     int clicks = 0;
     WidgetEvents ev;
@@ -158,7 +158,7 @@ TEST(ComboBox, ListIndexFollowsTheEditText) {
 
 TEST(ComboBox, DropDownListStyleTakesNoTyping) {
     RecordingContext ctx;
-    MiniComboBox c(ctx, "cbo", 1, 1200, 300);
+    ComboBoxModel c(ctx, "cbo", 1, 1200, 300);
     c.poke("Style", int16_t{2});
     c.Text("x");
     act(c, "type:ab");
@@ -170,7 +170,7 @@ TEST(ComboBox, DropDownListStyleTakesNoTyping) {
 
 TEST(ListBox, ListIndexRaisesClick) {
     RecordingContext ctx;
-    MiniListBox l(ctx, "lst", 1, 1200, 300);
+    ListBoxModel l(ctx, "lst", 1, 1200, 300);
     int clicks = 0;
     WidgetEvents ev;
     ev.click = [&] { ++clicks; };
@@ -184,7 +184,7 @@ TEST(ListBox, ListIndexRaisesClick) {
 
 TEST(CheckBox, ValueAndClicks) {
     RecordingContext ctx;
-    MiniCheckBox b(ctx, "chk", 1, 1200, 300);
+    CheckBoxModel b(ctx, "chk", 1, 1200, 300);
     int clicks = 0;
     WidgetEvents ev;
     ev.click = [&] { ++clicks; };
@@ -200,4 +200,4 @@ TEST(CheckBox, ValueAndClicks) {
 }
 
 }  // namespace
-}  // namespace kel::mini
+}  // namespace kel::model

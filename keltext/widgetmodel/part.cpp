@@ -1,8 +1,8 @@
-#include "keltext/minihost/part.h"
+#include "keltext/widgetmodel/part.h"
 
 #include "keltext/host/conversions.h"
 
-namespace kel::mini {
+namespace kel::model {
 
 std::optional<std::string> find_member(const Part& part, std::string_view name) {
     for (auto& m : part.members())
@@ -16,4 +16,4 @@ std::optional<std::string> find_notification(const Part& part, std::string_view 
     return std::nullopt;
 }
 
-}  // namespace kel::mini
+}  // namespace kel::model
