@@ -8,7 +8,8 @@
 #include "keltext/host/conversions.h"
 #include "keltext/host/date.h"
 #include "keltext/host/errors.h"
-#include "keltext/minihost/part.h"
+#include "keltext/widgetmodel/keyboard.h"
+#include "keltext/widgetmodel/part.h"
 
 namespace kel::web {
 namespace {
@@ -121,7 +122,7 @@ std::string WebForm::run(const std::function<Variant()>& action) {
         error = CallError{e.number(), e.what()};
     } catch (const mini::FormError& e) {
         error = CallError{0, e.what()};
-    } catch (const mini::SendKeysError& e) {
+    } catch (const model::SendKeysError& e) {
         error = CallError{0, e.what()};
     }
     std::string reply = "{\"value\":" + json_value(value) + ",\"error\":";
@@ -158,7 +159,7 @@ void WebForm::collect_state(std::string& out) {
         parts.emplace_back("surface", &c->surface_part());
         for (const auto& [part_name, p] : parts) {
             for (std::string_view wanted : kShownMembers) {
-                const auto member = mini::find_member(*p, wanted);
+                const auto member = model::find_member(*p, wanted);
                 if (!member) continue;
                 std::string value;
                 try {
@@ -173,7 +174,7 @@ void WebForm::collect_state(std::string& out) {
                 add("{\"t\":\"state\",\"c\":" + json_string(c->name()) + ",\"p\":" + json_string(part_name) +
                     ",\"m\":" + json_string(*member) + ",\"v\":" + value + "}");
             }
-            if (!mini::find_member(*p, "ListCount")) continue;
+            if (!model::find_member(*p, "ListCount")) continue;
             std::string list = "[";
             const auto count = static_cast<int32_t>(p->peek("ListCount").number());
             for (int32_t i = 0; i < count; ++i) {
