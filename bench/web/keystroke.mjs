@@ -67,6 +67,12 @@ export function table(rows) {
 }
 
 if (typeof process !== 'undefined' && process.argv?.[1]?.endsWith('keystroke.mjs')) {
-  const { default: createKelWeb } = await import(new URL(process.argv[2], `file://${process.cwd()}/`).href);
+  // Emscripten 3.1.6's ES module expects CommonJS's require and __dirname under Node.
+  const { createRequire } = await import('node:module');
+  const path = await import('node:path');
+  const file = path.resolve(process.argv[2]);
+  globalThis.require = createRequire(file);
+  globalThis.__dirname = path.dirname(file);
+  const { default: createKelWeb } = await import(`file://${file}`);
   console.log(table(run(await createKelWeb())));
 }
