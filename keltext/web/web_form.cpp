@@ -85,6 +85,9 @@ std::string json_value(const Variant& v) {
         case VarKind::Double: {
             const double d = v.number();
             if (!std::isfinite(d)) return "null";
+            // Whole numbers (sizes, colours, carets: most of what a view reads after each call)
+            // the short way; the host's number text is the costly part of a reply.
+            if (d == std::trunc(d) && std::fabs(d) < 9007199254740992.0) return std::to_string(static_cast<int64_t>(d));
             return v.kind() == VarKind::Single ? plain_number_text(*v.get_if<float>()) : plain_number_text(d);
         }
         case VarKind::Date: {
@@ -138,57 +141,64 @@ std::string WebForm::run(const std::function<Variant()>& action) {
 
 std::string WebForm::changes(bool everything) {
     if (everything) {
-        shown_.clear();
+        for (Watched& w : watched_) w.shown.reset();
         shown_focus_.reset();
     }
     return run([] { return Variant(); });
 }
 
+void WebForm::watch_parts() {
+    const std::vector<mini::HostedControl*> controls = form_.controls();
+    if (controls.size() == watched_controls_) return;
+    // Controls are only ever added: the members already watched keep what they last sent.
+    for (std::size_t i = watched_controls_; i < controls.size(); ++i) {
+        mini::HostedControl* c = controls[i];
+        std::vector<std::pair<std::string, mini::Part*>> parts = c->parts();
+        parts.emplace_back("surface", &c->surface_part());
+        for (const auto& [part_name, p] : parts) {
+            const std::string head = "{\"t\":\"state\",\"c\":" + json_string(c->name()) + ",\"p\":" +
+                                     json_string(part_name) + ",\"m\":";
+            for (std::string_view wanted : kShownMembers)
+                if (const auto member = model::find_member(*p, wanted))
+                    watched_.push_back({p, *member, head + json_string(*member) + ",\"v\":", false, std::nullopt});
+            if (model::find_member(*p, "ListCount"))
+                watched_.push_back({p, "List", head + "\"List\",\"v\":", true, std::nullopt});
+        }
+    }
+    watched_controls_ = controls.size();
+}
+
 void WebForm::collect_state(std::string& out) {
     out += '[';
     bool first = true;
-    auto add = [&](const std::string& item) {
+    auto add = [&](std::string_view item) {
         if (!first) out += ',';
         first = false;
         out += item;
     };
     for (const std::string& item : queue_) add(item);
     queue_.clear();
-    for (mini::HostedControl* c : form_.controls()) {
-        std::vector<std::pair<std::string, mini::Part*>> parts = c->parts();
-        parts.emplace_back("surface", &c->surface_part());
-        for (const auto& [part_name, p] : parts) {
-            for (std::string_view wanted : kShownMembers) {
-                const auto member = model::find_member(*p, wanted);
-                if (!member) continue;
-                std::string value;
-                try {
-                    value = json_value(p->peek(*member));
-                } catch (const RuntimeError&) {
-                    continue;
+    watch_parts();
+    std::string value;
+    for (Watched& w : watched_) {
+        try {
+            if (w.list) {
+                value = "[";
+                const auto count = static_cast<int32_t>(w.part->peek("ListCount").number());
+                for (int32_t i = 0; i < count; ++i) {
+                    if (i) value += ',';
+                    value += json_value(w.part->peek("List", i));
                 }
-                std::string key = c->name() + '\n' + part_name + '\n' + *member;
-                auto [it, added] = shown_.try_emplace(std::move(key), value);
-                if (!added && it->second == value) continue;
-                it->second = value;
-                add("{\"t\":\"state\",\"c\":" + json_string(c->name()) + ",\"p\":" + json_string(part_name) +
-                    ",\"m\":" + json_string(*member) + ",\"v\":" + value + "}");
+                value += ']';
+            } else {
+                value = json_value(w.part->peek(w.member));
             }
-            if (!model::find_member(*p, "ListCount")) continue;
-            std::string list = "[";
-            const auto count = static_cast<int32_t>(p->peek("ListCount").number());
-            for (int32_t i = 0; i < count; ++i) {
-                if (i) list += ',';
-                list += json_value(p->peek("List", i));
-            }
-            list += ']';
-            std::string key = c->name() + '\n' + part_name + "\nList";
-            auto [it, added] = shown_.try_emplace(std::move(key), list);
-            if (!added && it->second == list) continue;
-            it->second = list;
-            add("{\"t\":\"state\",\"c\":" + json_string(c->name()) + ",\"p\":" + json_string(part_name) +
-                ",\"m\":\"List\",\"v\":" + list + "}");
+        } catch (const RuntimeError&) {
+            continue;
         }
+        if (w.shown == value) continue;
+        w.shown = value;
+        add(w.head + value + "}");
     }
     mini::HostedControl* focused = form_.focused();
     const std::string focus = focused ? focused->name() : std::string();

@@ -9,7 +9,6 @@
 // (an error in the reply, nothing typed).
 #include <cstdint>
 #include <functional>
-#include <map>
 #include <optional>
 #include <span>
 #include <string>
@@ -91,13 +90,24 @@ private:
 
     mini::HostedControl& control(std::string_view name);
     mini::Part& part(mini::HostedControl& control, std::string_view name);
+    void watch_parts();
     void collect_state(std::string& out);
+
+    // A member a view draws, with the JSON it was last sent as.
+    struct Watched {
+        mini::Part* part;
+        std::string member;
+        std::string head;  // the change's JSON up to its value
+        bool list;         // the list's entries (List(0) .. List(ListCount - 1))
+        std::optional<std::string> shown;
+    };
 
     std::span<const ClassInfo> classes_;
     mini::Form form_;
     EventHandler handler_;
     std::vector<std::string> queue_;              // JSON objects of what happened, in order
-    std::map<std::string, std::string> shown_;    // "control\npart\nmember" -> JSON value last sent
+    std::vector<Watched> watched_;
+    std::size_t watched_controls_ = 0;
     std::optional<std::string> shown_focus_;
 };
 
