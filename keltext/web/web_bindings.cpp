@@ -43,6 +43,7 @@ val to_js(const Variant& v) {
 void assign_from_js(EventArg& arg, const val& v) {
     if (!v.isNumber() && !v.isTrue() && !v.isFalse()) return;
     const double d = v.as<double>();
+    if (std::isnan(d)) return;
     switch (arg.value.kind()) {
         case VarKind::Int16: arg.value = static_cast<int16_t>(std::clamp(d, -32768.0, 32767.0)); break;
         case VarKind::Int32: arg.value = static_cast<int32_t>(std::clamp(d, -2147483648.0, 2147483647.0)); break;
@@ -53,9 +54,13 @@ void assign_from_js(EventArg& arg, const val& v) {
     }
 }
 
+// An index from JavaScript; one no 32-bit number can hold becomes -1, which every list refuses
+// (error 381) as it refuses any index out of range.
 std::optional<int32_t> index_of(const val& index) {
     if (!index.isNumber()) return std::nullopt;
-    return static_cast<int32_t>(index.as<double>());
+    const double d = index.as<double>();
+    if (!(d >= INT32_MIN && d <= INT32_MAX)) return -1;
+    return static_cast<int32_t>(d);
 }
 
 }  // namespace
