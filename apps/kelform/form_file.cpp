@@ -468,7 +468,7 @@ void check_stored(mini::HostedControl& hosted, const SavedControl& c, const std:
 
 }  // namespace
 
-void open_form(mini::Form& form, const SavedForm& saved, std::span<const ClassInfo> classes, const std::string& file,
+void open_form(mini::FormDriver& form, const SavedForm& saved, std::span<const ClassInfo> classes, const std::string& file,
                Date today) {
     std::vector<mini::HostedControl*> loaded;
     loaded.reserve(saved.controls.size());
@@ -509,7 +509,7 @@ void open_form(mini::Form& form, const SavedForm& saved, std::span<const ClassIn
     }
 }
 
-SavedForm capture_form(mini::Form& form, const SavedForm& saved) {
+SavedForm capture_form(mini::FormDriver& form, const SavedForm& saved) {
     SavedForm out = saved;
     int next_row = 1;
     for (const SavedControl& c : out.controls) next_row = std::max(next_row, c.row + 2);

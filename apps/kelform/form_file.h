@@ -103,7 +103,7 @@ Date financial_year_end(Date day);
 // the stored values, then makes the opening settings. Errors name the file and line. A stored
 // value the control does not take (a key it does not store, a value of the wrong kind or out
 // of range, which would vanish the next time the form is saved) is an error too.
-void open_form(mini::Form& form, const SavedForm& saved, std::span<const ClassInfo> classes, const std::string& file,
+void open_form(mini::FormDriver& form, const SavedForm& saved, std::span<const ClassInfo> classes, const std::string& file,
                Date today);
 
 // Today's date on this machine's clock, in local time, or the date yyyy-mm-dd that the
@@ -113,7 +113,7 @@ Date local_today();
 // The saved form with each control's stored values replaced by what WriteProperties stores now.
 // Controls on the form that the saved form does not hold are added below the others, with their
 // name as the label and their present size.
-SavedForm capture_form(mini::Form& form, const SavedForm& saved);
+SavedForm capture_form(mini::FormDriver& form, const SavedForm& saved);
 
 class Player;
 // Adds `loadform FILE` and `saveform FILE` to a script player. Both remember the form file

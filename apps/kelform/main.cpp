@@ -13,14 +13,19 @@ int main(int argc, char** argv) {
     try {
         if (command == "play") {
             const auto scripts = std::span(args).subspan(1);
-            for (std::string_view a : scripts) {
+            for (std::size_t i = 0; i < scripts.size(); ++i) {
+                const std::string_view a = scripts[i];
                 if (a == "--help" || a == "-h") {
                     kel::kelform::print_usage(std::cout);
                     return 0;
                 }
+                if (a == "--host" && i == 0) {
+                    ++i;  // the host's name: play_command checks it
+                    continue;
+                }
                 if (a.starts_with("-") && a != "-") {
                     std::cerr << "kelform play: unknown option '" << a << "'\n"
-                              << "usage: kelform play SCRIPT.kfs ... ('-' reads standard input)\n";
+                              << "usage: kelform play [--host minimal|qt] SCRIPT.kfs ... ('-' reads standard input)\n";
                     return 2;
                 }
             }

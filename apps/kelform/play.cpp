@@ -6,6 +6,7 @@
 #include <string>
 
 #include "apps/kelform/form_file.h"
+#include "apps/kelform/qt_host.h"
 #include "apps/kelform/text_file.h"
 #include "apps/kelform/version.h"
 #include "keltext/library/catalogue.h"
@@ -16,7 +17,8 @@ namespace {
 }  // namespace
 
 int play(std::span<const std::string_view> scripts, std::span<const ClassInfo> classes, std::istream& in,
-         std::ostream& out, std::ostream& err, const PlayerSetup& setup, std::size_t max_file_bytes) {
+         std::ostream& out, std::ostream& err, const PlayerSetup& setup, std::size_t max_file_bytes,
+         const Player::FormMaker& make_form) {
     int status = 0;
     for (std::string_view script : scripts) {
         bool from_stdin = script == "-";
@@ -34,7 +36,7 @@ int play(std::span<const std::string_view> scripts, std::span<const ClassInfo> c
             status = 2;
             continue;
         }
-        Player player(classes, out);
+        Player player(classes, out, make_form);
         if (setup) setup(player);
         int s = player.run_script(text, name, err);
         if (s > status) status = s;
@@ -44,8 +46,24 @@ int play(std::span<const std::string_view> scripts, std::span<const ClassInfo> c
 }
 
 int play_command(std::span<const std::string_view> args, std::istream& in, std::ostream& out, std::ostream& err) {
+    Player::FormMaker make_form;
+    if (!args.empty() && args.front() == "--host") {
+        if (args.size() < 2) {
+            err << "kelform play: --host needs a host name (minimal or qt)\n";
+            return 2;
+        }
+        const std::string_view host = args[1];
+        args = args.subspan(2);
+        if (host == "qt") {
+            make_form = qt_form_maker(err);
+            if (!make_form) return 2;
+        } else if (host != "minimal") {
+            err << "kelform play: unknown host '" << host << "' (minimal or qt)\n";
+            return 2;
+        }
+    }
     if (args.empty()) {
-        err << "kelform play: no script given (usage: kelform play SCRIPT.kfs ...)\n";
+        err << "kelform play: no script given (usage: kelform play [--host minimal|qt] SCRIPT.kfs ...)\n";
         return 2;
     }
     const std::optional<std::size_t> limit = max_file_bytes_setting(err);
@@ -53,7 +71,7 @@ int play_command(std::span<const std::string_view> args, std::istream& in, std::
     Catalogue catalogue;
     return play(
         args, catalogue.classes(), in, out, err,
-        [&catalogue, limit](Player& p) { add_form_commands(p, catalogue.classes(), *limit); }, *limit);
+        [&catalogue, limit](Player& p) { add_form_commands(p, catalogue.classes(), *limit); }, *limit, make_form);
 }
 
 std::optional<std::size_t> max_file_bytes_setting(std::ostream& err) {
@@ -69,8 +87,11 @@ void print_usage(std::ostream& out) {
     out << "usage: kelform [--record FILE.json]   open the demo form in the terminal\n"
            "       kelform run FORM.kform [--record FILE.json]\n"
            "                                      open a form file in the terminal\n"
-           "       kelform play SCRIPT.kfs ...    run form scripts headless and print what happens\n"
-           "                                      ('-' reads the script from standard input)\n"
+           "       kelform play [--host minimal|qt] SCRIPT.kfs ...\n"
+           "                                      run form scripts headless and print what happens\n"
+           "                                      ('-' reads the script from standard input); --host qt\n"
+           "                                      runs them through real Qt widgets (offscreen when\n"
+           "                                      there is no display)\n"
            "       kelform --help                 show this help (also: run --help, play --help)\n"
            "       kelform --version              show the version\n"
            "\n"
@@ -95,7 +116,7 @@ void print_usage(std::ostream& out) {
            "  call NAME.Method [values ...]         peek NAME.part.Member[(index)]\n"
            "  poke NAME.part.Member[(index)] value  focus NAME|none\n"
            "  type \"text\"    key KEY    keydown KEY    keyup KEY    keypress CODE\n"
-           "  insert on|off    paste \"text\"    select NAME start length\n"
+           "  insert on|off    paste \"text\"    select NAME start length    clipboard [\"text\"]\n"
            "  click NAME.part    dblclick NAME.part    notify NAME.part.Notification\n"
            "  mousedown NAME.part button shift x y    mouseup NAME.part button shift x y\n"
            "  on NAME.Event ACTION    off NAME.Event\n"

@@ -23,9 +23,9 @@ using PlayerSetup = std::function<void(Player&)>;
 // than `max_file_bytes` is not run.
 int play(std::span<const std::string_view> scripts, std::span<const ClassInfo> classes, std::istream& in,
          std::ostream& out, std::ostream& err, const PlayerSetup& setup = {},
-         std::size_t max_file_bytes = kDefaultMaxFileBytes);
+         std::size_t max_file_bytes = kDefaultMaxFileBytes, const Player::FormMaker& make_form = {});
 
-// `kelform play ...` with the library's own classes.
+// `kelform play [--host minimal|qt] ...` with the library's own classes.
 int play_command(std::span<const std::string_view> args, std::istream& in, std::ostream& out, std::ostream& err);
 
 // The most bytes kelform reads from a file: KELFORM_MAX_FILE_BYTES when set, else the default.

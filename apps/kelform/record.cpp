@@ -98,13 +98,13 @@ bool kept(Field field, const Json& given, const Json& read) {
 
 }  // namespace
 
-std::string record_json(mini::Form& form) {
+std::string record_json(mini::FormDriver& form) {
     Json out = Json::object();
     for (mini::HostedControl* c : form.controls()) out[c->name()] = value_of(*c);
     return out.dump(2);
 }
 
-void load_record(mini::Form& form, std::string_view json_text, const std::string& file) {
+void load_record(mini::FormDriver& form, std::string_view json_text, const std::string& file) {
     // Keys are checked as they are parsed: a key twice is an error, not "the last one wins".
     std::set<std::string> seen;
     std::optional<std::string> twice;

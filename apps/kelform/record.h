@@ -19,7 +19,7 @@ public:
 };
 
 // The form's values as a record (two-space indented JSON, UTF-8).
-std::string record_json(mini::Form& form);
+std::string record_json(mini::FormDriver& form);
 
 // Loads a record into an opened form: each value, in the form's control order, is set through
 // the control's Text; the control is then focused and left, as after typing, and read back.
@@ -27,6 +27,6 @@ std::string record_json(mini::Form& form);
 // name the form lacks, a value of the wrong kind or text Windows-1252 cannot hold is a
 // RecordError naming `file` and the control. A null, or a control the record does not name,
 // leaves the control as the form opened it.
-void load_record(mini::Form& form, std::string_view json_text, const std::string& file);
+void load_record(mini::FormDriver& form, std::string_view json_text, const std::string& file);
 
 }  // namespace kel::kelform

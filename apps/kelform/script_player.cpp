@@ -119,8 +119,10 @@ struct Player::Handler {
     std::string text;      // echo
 };
 
-Player::Player(std::span<const ClassInfo> classes, std::ostream& out)
-    : classes_(classes), out_(out), form_(std::make_unique<mini::Form>(static_cast<mini::FormObserver*>(this))) {
+Player::Player(std::span<const ClassInfo> classes, std::ostream& out, const FormMaker& make_form)
+    : classes_(classes), out_(out) {
+    auto* observer = static_cast<model::FormObserver*>(this);
+    form_ = make_form ? make_form(observer) : std::make_unique<mini::Form>(observer);
     add_builtin_commands();
 }
 
@@ -142,7 +144,7 @@ void Player::add_builtin_commands() {
         {"insert", &Player::cmd_insert},   {"paste", &Player::cmd_paste},     {"select", &Player::cmd_select},
         {"notify", &Player::cmd_notify},   {"on", &Player::cmd_on},           {"off", &Player::cmd_off},
         {"trace", &Player::cmd_trace},     {"echo", &Player::cmd_echo},       {"expect", &Player::cmd_expect},
-        {"page", &Player::cmd_page},       {"apply", &Player::cmd_apply},
+        {"page", &Player::cmd_page},       {"apply", &Player::cmd_apply},     {"clipboard", &Player::cmd_clipboard},
     };
     for (const auto& entry : simple) {
         M fn = entry.second;
@@ -531,6 +533,16 @@ void Player::cmd_paste(Args& a) {
     a.finish();
     mini::HostedControl& c = focused_for_input();
     guarded(c.name(), [&] { form_->paste(text); });
+}
+
+void Player::cmd_clipboard(Args& a) {
+    if (a.done()) {
+        out_ << "clipboard = " << format_value(Variant(form_->clipboard())) << '\n';
+        return;
+    }
+    std::string text = a.text("text");
+    a.finish();
+    form_->set_clipboard(text);
 }
 
 void Player::cmd_select(Args& a) {

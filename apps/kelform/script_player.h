@@ -1,7 +1,7 @@
 #pragma once
-// The form script player: runs the commands of a form script against a minimal-host form and
-// prints what happens (events, queued keystrokes, property reads, run-time errors, failed
-// expectations). The terminal UI and form files reuse it and add their own commands.
+// The form script player: runs the commands of a form script against a form (the minimal
+// host's, or another host's through its form driver) and prints what happens (events, queued
+// keystrokes, property reads, run-time errors, failed expectations). The terminal UI and form files reuse it and add their own commands.
 #include <functional>
 #include <map>
 #include <memory>
@@ -43,10 +43,14 @@ private:
 
 using CommandFn = std::function<void(Player&, Args&)>;
 
-class Player : private mini::FormObserver {
+class Player : private model::FormObserver {
 public:
+    // Makes the form a player drives, telling it the observer to report to.
+    using FormMaker = std::function<std::unique_ptr<model::FormDriver>(model::FormObserver*)>;
+
     // `classes` are what `new`, `load` and `page` can create; they must outlive the player.
-    Player(std::span<const ClassInfo> classes, std::ostream& out);
+    // Without `make_form` the form is the minimal host's.
+    Player(std::span<const ClassInfo> classes, std::ostream& out, const FormMaker& make_form = {});
     ~Player() override;
     Player(const Player&) = delete;
     Player& operator=(const Player&) = delete;
@@ -61,7 +65,7 @@ public:
     // are delivered before it returns.
     void run_line(std::string_view line);
 
-    mini::Form& form() { return *form_; }
+    model::FormDriver& form() { return *form_; }
     std::ostream& out() { return out_; }
     bool expect_failed() const { return expect_failed_; }
 
@@ -104,6 +108,7 @@ private:
     void cmd_keypress(Args& a);
     void cmd_insert(Args& a);
     void cmd_paste(Args& a);
+    void cmd_clipboard(Args& a);
     void cmd_select(Args& a);
     void cmd_click(Args& a, bool dbl);
     void cmd_notify(Args& a);
@@ -141,7 +146,7 @@ private:
     bool refusal_reported_ = false;
     std::string file_;
     std::size_t line_ = 0;
-    std::unique_ptr<mini::Form> form_;  // last: destroyed first, while the rest is still whole
+    std::unique_ptr<model::FormDriver> form_;  // last: destroyed first, while the rest is still whole
 };
 
 }  // namespace kel::kelform

@@ -97,7 +97,7 @@ Date add_months(int year, int month, int day, int delta) {
 
 }  // namespace
 
-TerminalSession::TerminalSession(mini::Form& form, const SavedForm& saved, Date today)
+TerminalSession::TerminalSession(mini::FormDriver& form, const SavedForm& saved, Date today)
     : form_(form), saved_(saved), today_(today) {
     for (std::size_t i = 0; i < saved_.controls.size(); ++i) {
         const SavedControl& c = saved_.controls[i];

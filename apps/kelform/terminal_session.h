@@ -41,7 +41,7 @@ public:
 
     // The form must already hold the saved form's controls (open_form); the session becomes its
     // observer and puts focus in the first control that can take it.
-    TerminalSession(mini::Form& form, const SavedForm& saved, Date today);
+    TerminalSession(mini::FormDriver& form, const SavedForm& saved, Date today);
     ~TerminalSession() override;
     TerminalSession(const TerminalSession&) = delete;
     TerminalSession& operator=(const TerminalSession&) = delete;
@@ -146,7 +146,7 @@ private:
     void log(std::string line);
     void say(std::string message) { status_ = std::move(message); }
 
-    mini::Form& form_;
+    mini::FormDriver& form_;
     const SavedForm& saved_;
     Date today_;
     std::string status_;

@@ -53,6 +53,8 @@ constexpr ModifiedKey kModifiedKeys[] = {
     {"\033[1;2H", kVkHome, kShiftMask},      {"\033[1;2F", kVkEnd, kShiftMask},
     {"\033\033[A", kVkUp, kAltMask},         {"\033\033[B", kVkDown, kAltMask},
     {"\033[1;3H", kVkHome, kAltMask},        {"\033[1;3F", kVkEnd, kAltMask},
+    {"\033[2;2~", kVkInsert, kShiftMask},    {"\033[3;2~", kVkDelete, kShiftMask},
+    {"\033[2;5~", kVkInsert, kCtrlMask},
 };
 
 std::optional<Input> named_key(int code) {

@@ -32,6 +32,7 @@ public:
     }
     int& handler_depth() override { return handler_depth_; }
     bool delivering_sent_keys() const override { return delivering_; }
+    model::Clipboard& clipboard() override { return clipboard_; }
 
     MiniSite& site_of(HostedControl& c);
     MiniSite* find(std::string_view name);
@@ -56,6 +57,12 @@ public:
     FormObserver* observer_;
     bool user_mode_ = true;
     bool insert_ = false;
+    // The minimal host's clipboard lives as long as its form.
+    struct MemoryClipboard final : model::Clipboard {
+        std::string text() const override { return held; }
+        void set_text(std::string_view t) override { held = t; }
+        std::string held;
+    } clipboard_;
     int32_t next_handle_ = 0x100;
     std::vector<std::unique_ptr<MiniSite>> sites_;
     // Forms may hold tens of thousands of controls: names and sites are found through maps,
@@ -170,7 +177,7 @@ InputPart* FormImpl::input_target(MiniSite& s) {
 }
 
 void FormImpl::key_down(MiniSite& s, int16_t key_code, int16_t shift) {
-    if (key_code == kVkInsert) insert_ = !insert_;  // the toggle flips as the key goes down
+    if (model::toggles_insert(key_code, shift)) insert_ = !insert_;  // it flips as the key goes down
     if (InputPart* p = input_target(s)) p->user_key_down(key_code, shift);
 }
 
@@ -359,6 +366,8 @@ void Form::select(HostedControl& control, int32_t start, int32_t length) {
 
 void Form::set_insert(bool on) { impl_->insert_ = on; }
 bool Form::insert_on() const { return impl_->insert_; }
+void Form::set_clipboard(std::string_view text) { impl_->clipboard_.set_text(text); }
+std::string Form::clipboard() const { return impl_->clipboard_.text(); }
 
 void Form::click(HostedControl& control, Part& part) {
     InputPart& p = impl_->deliverable_part(control, part, "Click");

@@ -31,6 +31,7 @@ public:
     // How deep handlers run inside one another, over the whole form.
     virtual int& handler_depth() = 0;
     virtual bool delivering_sent_keys() const = 0;
+    virtual model::Clipboard& clipboard() = 0;
 };
 
 // The part "page" of a property page: its Changed flag, and the design-time services.
@@ -94,6 +95,7 @@ public:
     bool can_take_focus() const override { return !page_ && surface_.Enabled(); }
 
     // WidgetContext
+    model::Clipboard* clipboard() override { return &form_.clipboard(); }
     void handler_error(std::string_view part, std::string_view notification, int number) override;
     bool enter_handler() override;
     void leave_handler() override { --form_.handler_depth(); }

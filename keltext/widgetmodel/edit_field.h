@@ -47,7 +47,7 @@ public:
 
     void user_key_down(int16_t key_code, int16_t shift) override {
         this->fire_key("KeyDown", this->events_.key_down, key_code, shift);
-        if (key_code != 0) own_key_down(key_code, shift);
+        if (key_code != 0 && !clipboard_key_down(key_code, shift)) own_key_down(key_code, shift);
     }
     void user_key_press(int16_t char_code) override {
         if (this->events_.key_press)
@@ -58,7 +58,7 @@ public:
         this->fire_key("KeyUp", this->events_.key_up, key_code, shift);
     }
     void user_paste(std::string_view text) override {
-        if (!editable()) return;
+        if (!editable() || text.empty()) return;
         std::string piece(text);
         if (int32_t lim = limit(); lim > 0) {
             int32_t room = lim - (length() - sel_length_);
@@ -103,6 +103,28 @@ protected:
         } else if (inserts_character(char_code)) {
             type_char(static_cast<char>(static_cast<uint8_t>(char_code)));
         }
+    }
+
+    // The clipboard keys act as the key goes down, before the owner's key press sees the
+    // control code they also make (a control that narrows the selection on a key press would
+    // otherwise copy the narrowed one). True when the key was one of them.
+    bool clipboard_key_down(int16_t key_code, int16_t shift) {
+        const ClipboardKey key = clipboard_key(key_code, shift);
+        Clipboard* board = key == ClipboardKey::none ? nullptr : this->context_.clipboard();
+        if (!board) return false;
+        switch (key) {
+        case ClipboardKey::copy:
+            if (sel_length_ > 0) board->set_text(SelText());
+            break;
+        case ClipboardKey::cut:
+            if (sel_length_ == 0) break;
+            board->set_text(SelText());
+            if (editable()) own_key_down(kVkDelete, 0);  // the widget's own Delete of a selection
+            break;
+        case ClipboardKey::paste: user_paste(board->text()); break;
+        case ClipboardKey::none: break;
+        }
+        return true;
     }
 
     void move_caret(int32_t pos) {

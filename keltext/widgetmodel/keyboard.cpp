@@ -268,4 +268,21 @@ std::vector<SentKey> parse_send_keys(std::string_view keys) {
     return out;
 }
 
+ClipboardKey clipboard_key(int16_t key_code, int16_t shift) {
+    const int16_t held = static_cast<int16_t>(shift & (kShiftMask | kCtrlMask | kAltMask));
+    if (held == kCtrlMask) {
+        switch (key_code) {
+        case 'C': case kVkInsert: return ClipboardKey::copy;
+        case 'X': return ClipboardKey::cut;
+        case 'V': return ClipboardKey::paste;
+        default: return ClipboardKey::none;
+        }
+    }
+    if (held == kShiftMask) {
+        if (key_code == kVkDelete) return ClipboardKey::cut;
+        if (key_code == kVkInsert) return ClipboardKey::paste;
+    }
+    return ClipboardKey::none;
+}
+
 }  // namespace kel::model

@@ -28,6 +28,16 @@ Keystroke keystroke_for_char(uint8_t c);
 // "Ctrl+Up", "Shift+Tab", "a", "/", "Enter", "F4": nothing when the name is not a key.
 std::optional<Keystroke> parse_key(std::string_view name);
 
+// What a key down does to the clipboard in an edit field: Ctrl+C and Ctrl+Insert copy,
+// Ctrl+X and Shift+Delete cut, Ctrl+V and Shift+Insert paste.
+enum class ClipboardKey { none, copy, cut, paste };
+ClipboardKey clipboard_key(int16_t key_code, int16_t shift);
+
+// Insert alone flips overwrite; with Shift or Ctrl it is a clipboard key and flips nothing.
+inline bool toggles_insert(int16_t key_code, int16_t shift) {
+    return key_code == kVkInsert && (shift & (kShiftMask | kCtrlMask)) == 0;
+}
+
 // One synthetic keystroke of the send-keys notation.
 struct SentKey {
     enum Kind { tab, back_tab, keystroke } kind = keystroke;

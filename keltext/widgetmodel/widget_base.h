@@ -36,10 +36,20 @@ public:
     std::string where;  // "NAME.part.Notification"; empty until a widget's handler sees it
 };
 
+// The host's clipboard, holding text in the widgets' character set (Windows-1252).
+class Clipboard {
+public:
+    virtual ~Clipboard() = default;
+    virtual std::string text() const = 0;
+    virtual void set_text(std::string_view text) = 0;
+};
+
 // What a widget needs of the site that owns it.
 class WidgetContext {
 public:
     virtual ~WidgetContext() = default;
+    // Null when the host has none: the clipboard keys are then ordinary keys.
+    virtual Clipboard* clipboard() { return nullptr; }
     // A handler of the owner failed with a run-time error while the widget notified it.
     virtual void handler_error(std::string_view part, std::string_view notification, int number) = 0;
     // Brackets each handler call. False when handlers already run too deep inside one

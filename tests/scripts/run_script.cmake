@@ -1,10 +1,15 @@
-# Runs one script through `kelform play` and compares what it prints with the golden file.
+# Runs one script through `kelform play` (on the host HOST, when given) and compares what it
+# prints with the golden file.
 get_filename_component(dir ${SCRIPT} DIRECTORY)
 get_filename_component(name ${SCRIPT} NAME_WE)
 set(expected_file ${dir}/${name}.out)
 set(status_file ${dir}/${name}.status)
+set(host_args)
+if(DEFINED HOST)
+  set(host_args --host ${HOST})
+endif()
 # EMULATOR runs a program of another platform (node for the wasm build); empty natively.
-execute_process(COMMAND ${EMULATOR} ${KELFORM} play ${name}.kfs
+execute_process(COMMAND ${EMULATOR} ${KELFORM} play ${host_args} ${name}.kfs
   WORKING_DIRECTORY ${dir}
   OUTPUT_VARIABLE actual ERROR_VARIABLE errors RESULT_VARIABLE status TIMEOUT 60)
 set(expected_status 0)

@@ -115,5 +115,28 @@ TEST(ParseSendKeys, BadTextIsAClearError) {
     }
 }
 
+TEST(ClipboardKeys, ChordsAndWhatTheyDo) {
+    struct Case {
+        int16_t key, shift;
+        ClipboardKey action;
+        bool toggles;  // flips overwrite
+    };
+    const int16_t ctrl = kCtrlMask, shift = kShiftMask, alt = kAltMask;
+    const Case cases[] = {
+        {'C', ctrl, ClipboardKey::copy, false},         {kVkInsert, ctrl, ClipboardKey::copy, false},
+        {'X', ctrl, ClipboardKey::cut, false},          {kVkDelete, shift, ClipboardKey::cut, false},
+        {'V', ctrl, ClipboardKey::paste, false},        {kVkInsert, shift, ClipboardKey::paste, false},
+        {kVkInsert, 0, ClipboardKey::none, true},       {kVkInsert, alt, ClipboardKey::none, true},
+        {'C', 0, ClipboardKey::none, false},            {'C', static_cast<int16_t>(ctrl | shift), ClipboardKey::none, false},
+        {'V', static_cast<int16_t>(ctrl | alt), ClipboardKey::none, false}, {kVkDelete, 0, ClipboardKey::none, false},
+        {kVkInsert, static_cast<int16_t>(ctrl | shift), ClipboardKey::none, false},
+    };
+    for (const auto& c : cases) {
+        SCOPED_TRACE(testing::Message() << c.key << " shift " << c.shift);
+        EXPECT_EQ(clipboard_key(c.key, c.shift), c.action);
+        EXPECT_EQ(toggles_insert(c.key, c.shift), c.toggles);
+    }
+}
+
 }  // namespace
 }  // namespace kel::model
