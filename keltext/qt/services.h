@@ -16,6 +16,11 @@
 //     activation do not change it).
 //   - tab(forward): the form's Tab, through Qt focus.
 //   - sync_all(): brings every view in line with its model (after a driver poked a part).
+//   - key_down / key_press / key_up / paste(site, ...): input with no faithful Qt event, to the
+//     model directly as the minimal form delivers it.
+//   - clipboard(): the clipboard the edit fields' clipboard keys use (the system's).
+// Clicks and notifications on a constituent: deliver_click / deliver_notification (views.h),
+// or QTest mouse events on QtSite::view_of(part).
 #include <QObject>
 #include <QPointer>
 #include <cstdint>
