@@ -3,14 +3,15 @@
 // control has focus as the controls see it, the handler depth shared by all controls, the
 // class catalogue, and the routing of Qt's input events into the widget models.
 //
-// One object per application, a child of the QCoreApplication (Services::of finds or makes
+// One object per application, a child of the QCoreApplication (of_application finds or makes
 // it), so that the application and a Designer plugin share it through the one shared library.
 //
 // Internal API for a form driver (kelform's Qt player, tests):
 //   - set_observer(model::FormObserver*): events raised (with mutable arguments), keys sent,
 //     properties changed, handler errors and refused focus reach the driver, as on the
 //     minimal host. Without an observer, events go only to the wrappers' signals.
-//   - run_pending(): delivers queued send-keys now (the views do it after each user action).
+//   - run_pending(): delivers queued send-keys now (the views do it after each user action);
+//     after_input(): that, then sync_all().
 //   - set_insert / insert_on: the Insert toggle.
 //   - focused(): the control that has focus as the controls see it (popup menus and window
 //     activation do not change it).
