@@ -19,6 +19,7 @@
 #include "apps/kelform/text_file.h"
 #include "keltext/host/charset.h"
 #include "keltext/host/conversions.h"
+#include "keltext/host/float_chars.h"
 #include "keltext/host/font.h"
 #include "keltext/minihost/property_store.h"
 #include "keltext/host/errors.h"
@@ -53,7 +54,7 @@ std::optional<int> parse_cell(std::string_view s) {
 std::optional<float> parse_twips(std::string_view s) {
     if (s.empty() || !((s[0] >= '0' && s[0] <= '9') || s[0] == '.')) return std::nullopt;
     float v = 0;
-    const auto [end, ec] = std::from_chars(s.data(), s.data() + s.size(), v);
+    const auto [end, ec] = parse_float(s.data(), s.data() + s.size(), v);
     if (ec != std::errc() || end != s.data() + s.size() || !(v > 0) || v > kMaxTwips) return std::nullopt;
     return v;
 }

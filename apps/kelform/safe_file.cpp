@@ -15,6 +15,8 @@
 #include <ctime>
 #include <system_error>
 
+#include "keltext/host/float_chars.h"
+
 namespace kel::kelform {
 
 SaveError::SaveError(const std::string& path, const std::string& reason)
@@ -161,7 +163,7 @@ void test_pause() {
     if (!text || !*text) return;
     double seconds = 0;
     const char* end = text + std::strlen(text);
-    const auto r = std::from_chars(text, end, seconds);
+    const auto r = parse_float(text, end, seconds);
     if (r.ec != std::errc() || r.ptr != end || !(seconds > 0)) return;
     seconds = std::min(seconds, 600.0);
     timespec left{};

@@ -8,6 +8,7 @@
 #include <system_error>
 
 #include "keltext/host/errors.h"
+#include "keltext/host/float_chars.h"
 
 namespace kel {
 namespace {
@@ -80,7 +81,7 @@ ReadValue decimal_value(const DecimalParts& p) {
     const int64_t scale = magnitude - static_cast<int64_t>(digits.size());
     std::string text = digits + 'e' + std::to_string(scale);
     double value = 0;
-    const auto res = std::from_chars(text.data(), text.data() + text.size(), value);
+    const auto res = parse_float(text.data(), text.data() + text.size(), value);
     if (res.ec == std::errc::result_out_of_range) {
         if (magnitude > 0) return {sign * DBL_MAX, true};
         return {};
@@ -188,7 +189,7 @@ struct Rounded {
 template <class T>
 Rounded round_to_digits(T magnitude, int precision) {
     char buf[64];
-    const auto res = std::to_chars(buf, buf + sizeof buf, magnitude, std::chars_format::scientific, precision - 1);
+    const auto res = format_float(buf, buf + sizeof buf, magnitude, std::chars_format::scientific, precision - 1);
     const std::string_view s(buf, static_cast<size_t>(res.ptr - buf));
     Rounded r;
     const size_t epos = s.find('e');

@@ -11,6 +11,7 @@
 #include "keltext/host/charset.h"
 #include "keltext/host/conversions.h"
 #include "keltext/host/date.h"
+#include "keltext/host/float_chars.h"
 #include "keltext/host/font.h"
 
 namespace kel {
@@ -106,7 +107,7 @@ DecimalShape decimal_shape(std::string_view s) {
     return shape;
 }
 
-// from_chars takes no '+'.
+// parse_float takes no '+'.
 std::string_view without_plus(std::string_view s) { return (!s.empty() && s[0] == '+') ? s.substr(1) : s; }
 
 template <class F>
@@ -114,7 +115,7 @@ std::optional<F> read_floating(std::string_view s) {
     if (!decimal_shape(s).ok) return std::nullopt;
     s = without_plus(s);
     F value{};
-    auto [end, ec] = std::from_chars(s.data(), s.data() + s.size(), value);
+    auto [end, ec] = parse_float(s.data(), s.data() + s.size(), value);
     if (ec != std::errc() || end != s.data() + s.size() || !std::isfinite(value)) return std::nullopt;
     return value;
 }
@@ -241,10 +242,10 @@ void append_hex(std::string& out, unsigned char c) {
 // (5000000, not 5e+06), so that a person reads the file easily.
 std::string shortest_text(double v) {
     char buf[400];
-    if (const auto r = std::to_chars(buf, buf + sizeof buf, v, std::chars_format::fixed);
+    if (const auto r = format_float(buf, buf + sizeof buf, v, std::chars_format::fixed);
         r.ec == std::errc() && r.ptr - buf <= 20)
         return std::string(buf, r.ptr);
-    const auto r = std::to_chars(buf, buf + sizeof buf, v);
+    const auto r = format_float(buf, buf + sizeof buf, v);
     return std::string(buf, r.ptr);
 }
 
@@ -264,7 +265,7 @@ bool names_colour(std::string_view key) {
 
 std::string float_text(float v) {
     char buf[32];
-    const auto r = std::to_chars(buf, buf + sizeof buf, v);
+    const auto r = format_float(buf, buf + sizeof buf, v);
     return std::string(buf, r.ptr);
 }
 

@@ -196,8 +196,8 @@ void ControlWidget::report_text(const char* message) {
 
 QSize ControlWidget::sizeHint() const {
     if (!site_) return {};
-    auto& s = const_cast<QtSite&>(*site_);
-    return {s.to_pixels(s.surface_model().Width()), s.to_pixels(s.surface_model().Height())};
+    const model::SurfaceModel& surface = site_->surface_model();
+    return {site_->to_pixels(surface.Width()), site_->to_pixels(surface.Height())};
 }
 
 void ControlWidget::emitEvent(int, std::span<EventArg>) {}

@@ -250,9 +250,10 @@ bool Services::route_key_release(QtSite& site, QKeyEvent* e) {
     return true;
 }
 
-void Services::route_focus_in(QtSite& site, QFocusEvent* e) {
+void Services::route_focus_in(QtSite& site, QFocusEvent*) {
+    // Whatever the reason, focus is in this control now; only a control that had it already
+    // (back from a popup or another window) enters nothing.
     if (focused_ == &site) return;
-    (void)e;  // whatever the reason, focus is in this control now
     set_control_focus(&site);
     after_input();
 }

@@ -110,6 +110,7 @@ public:
     // model; nothing for a part without a text view.
     std::optional<std::string> shown_text(const model::Part& part);
     model::SurfaceModel& surface_model() { return surface_; }
+    const model::SurfaceModel& surface_model() const { return surface_; }
     model::InputPart* keyboard_input() { return keyboard_part_; }
     model::InputPart* input_part(model::Part* p);
     // The part whose view is `w`, or null.

@@ -298,14 +298,19 @@ void ComboView::showPopup() {
         popup_ = new QListWidget(this);
         popup_->setWindowFlags(Qt::Popup);
         popup_->setFocusPolicy(Qt::NoFocus);
-        connect(popup_, &QListWidget::itemClicked, this, [this](QListWidgetItem* item) {
+        const auto pick = [this](QListWidgetItem* item) {
+            // Styles that activate on a single click send both signals for one click.
+            if (!popup_->isVisible()) return;
             const int row = popup_->row(item);
             popup_->hide();
             site_.services().run_pending();
             if (row >= 0 && row < combo_.ListCount() && takes_input(site_, combo_))
                 site_.guarded(combo_.part_name(), "Click", [&] { combo_.ListIndex(row); });
             site_.services().after_input();
-        });
+        };
+        // A click on an entry, or Enter on the one the arrow keys reached.
+        connect(popup_, &QListWidget::itemClicked, this, pick);
+        connect(popup_, &QListWidget::itemActivated, this, pick);
     }
     popup_->clear();
     std::string scratch;

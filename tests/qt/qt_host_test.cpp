@@ -9,6 +9,8 @@
 #include <QLineEdit>
 #include <QListWidget>
 #include <QMenu>
+#include <QMimeData>
+#include <QDropEvent>
 #include <QTest>
 #include <QTimer>
 #include <algorithm>
@@ -84,6 +86,8 @@ private slots:
     void combo_list_never_rewrites_the_edit_text();
     void disabled_surface_takes_no_focus_and_is_not_greyed();
     void sizes_are_twips_and_pixels_follow();
+    void tab_release_and_lone_modifiers_are_not_delivered();
+    void drop_undo_and_middle_click_never_bypass_the_model();
     void combo_list_opens_and_a_pick_is_the_models();
 };
 
@@ -385,6 +389,51 @@ void QtHostTest::combo_list_opens_and_a_pick_is_the_models() {
     QCOMPARE(events.count("c.Click"), 1);
     QCOMPARE(shown(c), std::string("Card"));
     form.set_observer(nullptr);
+}
+
+void QtHostTest::tab_release_and_lone_modifiers_are_not_delivered() {
+    FormWindow form;
+    Recorder events;
+    const ClassInfo& cls = *form.services().catalogue().find("KelAlphaNumeric");
+    QtSite& a = form.create(cls, "a");
+    QtSite& b = form.create(cls, "b");
+    form.focus(&a);
+    form.set_observer(&events);
+    QTest::keyPress(a.focus_view(), Qt::Key_Shift, Qt::ShiftModifier);
+    QTest::keyRelease(a.focus_view(), Qt::Key_Shift);
+    QTest::keyPress(a.focus_view(), Qt::Key_Tab);
+    QCOMPARE(form.focused(), &b);
+    QTest::keyRelease(b.focus_view(), Qt::Key_Tab);  // Tab's release lands in the control it moved to
+    QVERIFY2(events.lines.empty(), events.lines.empty() ? "" : events.lines.front().c_str());
+    QTest::keyClick(b.focus_view(), Qt::Key_Backtab, Qt::ShiftModifier);
+    QCOMPARE(form.focused(), &a);
+    form.set_observer(nullptr);
+}
+
+void QtHostTest::drop_undo_and_middle_click_never_bypass_the_model() {
+    FormWindow form;
+    QtSite& n = form.create(*form.services().catalogue().find("KelNumeric"), "n");
+    form.focus(&n);
+    QTest::keyClicks(n.focus_view(), "12");
+    auto* view = qobject_cast<QLineEdit*>(n.focus_view());
+    // Text dropped on the view would go around the box's filter: refused.
+    QMimeData mime;
+    mime.setText("abc");
+    QDropEvent drop(QPointF(2, 2), Qt::CopyAction, &mime, Qt::LeftButton, Qt::NoModifier);
+    QApplication::sendEvent(view, &drop);
+    QCOMPARE(peek_text(n), std::string("12"));
+    // QLineEdit's own undo never runs: Ctrl+Z is a key for the box (which types nothing).
+    QTest::keyClick(view, Qt::Key_Z, Qt::ControlModifier);
+    view->undo();
+    form.sync();
+    QCOMPARE(peek_text(n), std::string("12"));
+    QCOMPARE(view->text(), QString("12"));
+    // A middle click pastes the selection clipboard through the model's paste, where there is one.
+    if (QApplication::clipboard()->supportsSelection()) {
+        QApplication::clipboard()->setText("x5", QClipboard::Selection);
+        QTest::mouseClick(view, Qt::MiddleButton, {}, QPoint(1, 1));
+        QCOMPARE(view->text(), QString::fromStdString(peek_text(n)));
+    }
 }
 
 QTEST_MAIN(QtHostTest)

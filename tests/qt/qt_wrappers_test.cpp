@@ -62,6 +62,7 @@ private slots:
     void settings_round_trip_equals_the_minimal_host_data();
     void settings_round_trip_equals_the_minimal_host();
     void settings_load_where_properties_in_order_would_not();
+    void variant_map_bag_round_trip();
     void settings_errors_name_the_line();
     void methods_are_invokable();
 };
@@ -179,6 +180,19 @@ void QtWrappersTest::settings_load_where_properties_in_order_would_not() {
     loaded.setKelSettings("store Maxvalue 5000\nstore NoOfDecimals 2\n");
     QCOMPARE(loaded.MaxValue(), 5000.0);
     QCOMPARE(loaded.NoOfDecimals(), 2);
+}
+
+void QtWrappersTest::variant_map_bag_round_trip() {
+    // Each stored value keeps its kind through the map: a 16-bit MaxLength stays 16-bit.
+    for (const auto& [cls, text] : kStores) {
+        const ClassInfo* info = Services::of_application().catalogue().find(cls);
+        std::unique_ptr<ControlWidget> from(create_control_widget({info, "a", 1200, 300, parse_store_text(text)}, nullptr));
+        std::unique_ptr<ControlWidget> to(create_control_widget({info, "b", 1200, 300, std::nullopt}, nullptr));
+        const QVariantMap map = from->saveToMap();
+        QVERIFY(!map.isEmpty());
+        to->loadFromMap(map);
+        QCOMPARE(to->kelSettings(), from->kelSettings());
+    }
 }
 
 void QtWrappersTest::settings_errors_name_the_line() {
