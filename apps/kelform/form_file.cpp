@@ -23,6 +23,7 @@
 #include "keltext/host/font.h"
 #include "keltext/minihost/property_store.h"
 #include "keltext/host/errors.h"
+#include "keltext/host/value_literal.h"
 
 namespace kel::kelform {
 
@@ -58,11 +59,6 @@ std::optional<float> parse_twips(std::string_view s) {
     return v;
 }
 
-std::string float_text(float v) {
-    char buf[32];
-    const auto r = format_float(buf, buf + sizeof buf, v);
-    return std::string(buf, r.ptr);
-}
 
 class Parser {
 public:
@@ -260,97 +256,6 @@ private:
 };
 
 }  // namespace
-
-std::string string_literal(std::string_view s) {
-    static constexpr char kHex[] = "0123456789ABCDEF";
-    std::string out = "\"";
-    for (char c : s) {
-        const auto b = static_cast<unsigned char>(c);
-        if (c == '"' || c == '\\') {
-            out += '\\';
-            out += c;
-        } else if (c == '\t') {
-            out += "\\t";
-        } else if (c == '\n') {
-            out += "\\n";
-        } else if (c == '\r') {
-            out += "\\r";
-        } else if (b < 0x20 || b >= 0x7F) {
-            out += "\\x";
-            out += kHex[b >> 4];
-            out += kHex[b & 15];
-        } else {
-            out += c;
-        }
-    }
-    return out + "\"";
-}
-
-namespace {
-
-// The shortest text that reads back as the same double; plain digits where that stays short
-// (5000000, not 5e+06), so that a person reads the file easily.
-std::string shortest_text(double v) {
-    char buf[400];
-    if (const auto r = format_float(buf, buf + sizeof buf, v, std::chars_format::fixed);
-        r.ec == std::errc() && r.ptr - buf <= 20)
-        return std::string(buf, r.ptr);
-    const auto r = format_float(buf, buf + sizeof buf, v);
-    return std::string(buf, r.ptr);
-}
-
-std::string double_literal(double v) {
-    const std::string text = shortest_text(v);
-    // A bare literal without a point or exponent would read back as an integer.
-    const bool reads_as_double = text.find('.') != std::string::npos && text.find('e') == std::string::npos;
-    return reads_as_double ? text : "f64:" + text;
-}
-
-bool names_colour(std::string_view key) {
-    const std::string upper = upper_case(key);
-    return upper.find("COLOR") != std::string::npos || upper.find("COLOUR") != std::string::npos;
-}
-
-}  // namespace
-
-std::string value_literal(const Variant& v, std::string_view key) {
-    switch (v.kind()) {
-        case VarKind::Empty: return "empty";
-        case VarKind::Boolean: return *v.get_if<bool>() ? "true" : "false";
-        case VarKind::Byte: return "u8:" + std::to_string(*v.get_if<uint8_t>());
-        case VarKind::Int16: return std::to_string(*v.get_if<int16_t>());
-        case VarKind::Int32: {
-            const int32_t n = *v.get_if<int32_t>();
-            if (names_colour(key)) {
-                char buf[16];
-                std::snprintf(buf, sizeof buf, "0x%06X", static_cast<uint32_t>(n));
-                return buf;
-            }
-            if (n >= std::numeric_limits<int16_t>::min() && n <= std::numeric_limits<int16_t>::max())
-                return "i32:" + std::to_string(n);
-            return std::to_string(n);
-        }
-        case VarKind::Single: return "f32:" + float_text(*v.get_if<float>());
-        case VarKind::Double: return double_literal(*v.get_if<double>());
-        case VarKind::Date: {
-            const Ymd d = to_ymd(*v.get_if<Date>());
-            char buf[32];
-            std::snprintf(buf, sizeof buf, "date:%04d-%02d-%02d", d.year, d.month, d.day);
-            return buf;
-        }
-        case VarKind::String: return string_literal(v.str());
-        case VarKind::Object: {
-            if (const auto f = font_of(v)) {
-                std::string out = "font:" + string_literal(f->name) + ":" + shortest_text(f->size);
-                if (f->bold) out += ":bold";
-                if (f->italic) out += ":italic";
-                return out;
-            }
-            return "empty";
-        }
-    }
-    return "empty";
-}
 
 SavedForm parse_form(std::string_view text, const std::string& file, std::span<const ClassInfo> classes) {
     return Parser(file, classes).parse(text);

@@ -14,6 +14,7 @@
 
 #include "apps/kelform/text_file.h"
 #include "keltext/host/date.h"
+#include "keltext/host/value_literal.h"
 #include "keltext/host/variant.h"
 #include "keltext/host/members.h"
 #include "keltext/minihost/form.h"
@@ -85,11 +86,9 @@ std::string write_form(const SavedForm& form);
 // "voucher.kform: Permission denied", when it cannot).
 void write_form_file(const std::string& path, const SavedForm& form);
 
-// Value literals as form files and scripts write them: a literal that reads back as the same
-// kind and value. `key` only chooses the hex form for colours.
-std::string value_literal(const Variant& v, std::string_view key = {});
-// A quoted string with the script language's escapes; bytes outside printable ASCII as \xHH.
-std::string string_literal(std::string_view s);
+// Value literals as form files and scripts write them: the host's (keltext/host/value_literal.h).
+using kel::string_literal;
+using kel::value_literal;
 // The value of a `set` literal: a value literal, or one of the date words `today`,
 // `fy-start`, `fy-end` (the financial year, April to March, that holds `today`).
 // ScriptError when malformed.

@@ -279,6 +279,10 @@ std::pair<Variant, std::optional<int>> Player::read(const Member& m) {
 }
 
 void Player::write(const Member& m, const Variant& value) {
+    struct Shown {
+        model::FormDriver& form;
+        ~Shown() { form.members_changed(); }
+    } shown{*form_};
     if (m.property) {
         m.control->dispatch().set(m.property->name, value, m.index ? &*m.index : nullptr);
         return;
@@ -286,6 +290,11 @@ void Player::write(const Member& m, const Variant& value) {
     std::optional<int32_t> index;
     if (m.index) index = to_int32(*m.index);
     m.part->poke(m.member, value, index);
+}
+
+std::pair<Variant, std::optional<int>> Player::read_checked(const Member& m) {
+    form_->check_views(*m.control);
+    return read(m);
 }
 
 // ---- form observer ----
@@ -410,7 +419,7 @@ void Player::cmd_set(Args& a) {
 void Player::cmd_get(Args& a) {
     Member m = resolve(a.next("NAME.Prop"), false, true);
     a.finish();
-    auto [value, error] = read(m);
+    auto [value, error] = read_checked(m);
     out_ << m.label << (error ? " -> " + format_error(*error) : " = " + format_value(value)) << '\n';
 }
 
@@ -429,12 +438,13 @@ void Player::cmd_call(Args& a) {
     for (std::size_t i = values.size(); i < method->args.size(); ++i)
         if (!method->args[i].optional) throw ScriptError("missing argument: " + method->args[i].name);
     guarded(c.name() + "." + method->name, [&] { c.dispatch().call(method->name, values); });
+    form_->members_changed();
 }
 
 void Player::cmd_peek(Args& a) {
     Member m = resolve(a.next("NAME.part.Member"), true, false);
     a.finish();
-    auto [value, error] = read(m);
+    auto [value, error] = read_checked(m);
     out_ << m.label << (error ? " -> " + format_error(*error) : " = " + format_value(value)) << '\n';
 }
 
@@ -671,7 +681,7 @@ void Player::cmd_expect(Args& a) {
     Expected expected = parse_expected(a.next("value"));
     a.finish();
     Member m = resolve(word, true, true);
-    auto [value, error] = read(m);
+    auto [value, error] = read_checked(m);
     bool held = expected.error ? error == expected.error : !error && same_value(value, expected.value);
     if (held) return;
     expect_failed_ = true;

@@ -131,6 +131,8 @@ private:
     PartRef resolve_part(std::string_view control_name, std::string_view part_name);
     // Reads a member; a run-time error comes back as its number.
     std::pair<Variant, std::optional<int>> read(const Member& m);
+    // The same for a command of the script: a host with views first checks that they show it.
+    std::pair<Variant, std::optional<int>> read_checked(const Member& m);
     void write(const Member& m, const Variant& value);
     mini::HostedControl& focused_for_input();
     void keystroke(const model::Keystroke& k);

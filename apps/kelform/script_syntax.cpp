@@ -9,226 +9,15 @@
 #include <system_error>
 
 #include "keltext/host/conversions.h"
-#include "keltext/host/float_chars.h"
 #include "keltext/host/date.h"
 #include "keltext/host/font.h"
+#include "keltext/host/value_literal.h"
 
 namespace kel::kelform {
 namespace {
 
-bool is_blank(char c) { return c == ' ' || c == '\t'; }
-bool is_digit(char c) { return c >= '0' && c <= '9'; }
 bool is_name_char(char c) {
-    return is_digit(c) || (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z') || c == '_';
-}
-
-int hex_digit(char c) {
-    if (c >= '0' && c <= '9') return c - '0';
-    if (c >= 'a' && c <= 'f') return c - 'a' + 10;
-    if (c >= 'A' && c <= 'F') return c - 'A' + 10;
-    return -1;
-}
-
-[[noreturn]] void malformed_value(std::string_view word) {
-    throw ScriptError("malformed value '" + shown(word) + "'");
-}
-
-// Reads the quoted string that starts at s[pos] (a '"'); returns the bytes and moves pos past
-// the closing quote.
-std::string read_string(std::string_view s, std::size_t& pos, std::string_view word) {
-    std::string out;
-    std::size_t i = pos + 1;
-    while (i < s.size() && s[i] != '"') {
-        char c = s[i];
-        if (c != '\\') {
-            out += c;
-            ++i;
-            continue;
-        }
-        if (i + 1 >= s.size()) {
-            i = s.size();  // a backslash at the very end: the string never closes
-            break;
-        }
-        char e = s[i + 1];
-        switch (e) {
-        case '"': out += '"'; break;
-        case '\\': out += '\\'; break;
-        case 't': out += '\t'; break;
-        case 'n': out += '\n'; break;
-        case 'r': out += '\r'; break;
-        case 'x': {
-            int hi = i + 2 < s.size() ? hex_digit(s[i + 2]) : -1;
-            int lo = i + 3 < s.size() ? hex_digit(s[i + 3]) : -1;
-            if (hi < 0 || lo < 0)
-                throw ScriptError("malformed string '" + shown(word) + "': \\x needs two hex digits");
-            out += static_cast<char>(hi * 16 + lo);
-            i += 2;
-            break;
-        }
-        default:
-            throw ScriptError("malformed string '" + shown(word) + "': unknown escape '\\" +
-                              shown(std::string_view(&s[i + 1], 1)) + "'");
-        }
-        i += 2;
-    }
-    if (i >= s.size()) throw ScriptError("malformed string '" + shown(word) + "': no closing quote");
-    pos = i + 1;
-    return out;
-}
-
-// The shape of a decimal number: [+-] (digits [. digits] | . digits) [e [+-] digits].
-struct DecimalShape {
-    bool ok = false;
-    bool integral = false;  // no point, no exponent
-};
-
-DecimalShape decimal_shape(std::string_view s) {
-    DecimalShape shape;
-    std::size_t i = 0;
-    if (i < s.size() && (s[i] == '+' || s[i] == '-')) ++i;
-    std::size_t int_digits = 0, frac_digits = 0;
-    while (i < s.size() && is_digit(s[i])) ++i, ++int_digits;
-    bool point = false, exponent = false;
-    if (i < s.size() && s[i] == '.') {
-        point = true;
-        ++i;
-        while (i < s.size() && is_digit(s[i])) ++i, ++frac_digits;
-    }
-    if (int_digits + frac_digits == 0) return shape;
-    if (i < s.size() && (s[i] == 'e' || s[i] == 'E')) {
-        exponent = true;
-        ++i;
-        if (i < s.size() && (s[i] == '+' || s[i] == '-')) ++i;
-        std::size_t exp_digits = 0;
-        while (i < s.size() && is_digit(s[i])) ++i, ++exp_digits;
-        if (exp_digits == 0) return shape;
-    }
-    if (i != s.size()) return shape;
-    shape.ok = true;
-    shape.integral = !point && !exponent;
-    return shape;
-}
-
-// parse_float takes no '+'.
-std::string_view without_plus(std::string_view s) { return (!s.empty() && s[0] == '+') ? s.substr(1) : s; }
-
-template <class F>
-std::optional<F> read_floating(std::string_view s) {
-    if (!decimal_shape(s).ok) return std::nullopt;
-    s = without_plus(s);
-    F value{};
-    auto [end, ec] = parse_float(s.data(), s.data() + s.size(), value);
-    if (ec != std::errc() || end != s.data() + s.size() || !std::isfinite(value)) return std::nullopt;
-    return value;
-}
-
-// A whole number written in decimal ([+-]digits) or as 0x hex of at most `hex_digits` digits
-// (a bit pattern, returned as its unsigned value).
-struct Whole {
-    bool hex = false;
-    int64_t value = 0;
-};
-
-std::optional<Whole> read_whole(std::string_view s, std::size_t max_hex_digits) {
-    if (s.size() > 2 && s[0] == '0' && (s[1] == 'x' || s[1] == 'X')) {
-        std::string_view digits = s.substr(2);
-        if (digits.size() > max_hex_digits) return std::nullopt;
-        int64_t v = 0;
-        for (char c : digits) {
-            int d = hex_digit(c);
-            if (d < 0) return std::nullopt;
-            v = v * 16 + d;
-        }
-        return Whole{true, v};
-    }
-    DecimalShape shape = decimal_shape(s);
-    if (!shape.ok || !shape.integral) return std::nullopt;
-    bool negative = s[0] == '-';
-    std::size_t i = (s[0] == '-' || s[0] == '+') ? 1 : 0;
-    while (i + 1 < s.size() && s[i] == '0') ++i;
-    if (s.size() - i > 12) return std::nullopt;  // far outside every integer kind here
-    int64_t v = 0;
-    for (; i < s.size(); ++i) v = v * 10 + (s[i] - '0');
-    return Whole{false, negative ? -v : v};
-}
-
-// A plain numeric literal, typed as BASIC types it.
-std::optional<Variant> read_number(std::string_view s) {
-    if (s.size() > 2 && s[0] == '0' && (s[1] == 'x' || s[1] == 'X')) {
-        auto w = read_whole(s, 8);
-        if (!w) return std::nullopt;
-        return Variant(static_cast<int32_t>(static_cast<uint32_t>(w->value)));
-    }
-    DecimalShape shape = decimal_shape(s);
-    if (!shape.ok) return std::nullopt;
-    if (shape.integral) {
-        if (auto w = read_whole(s, 0)) {
-            if (w->value >= std::numeric_limits<int16_t>::min() && w->value <= std::numeric_limits<int16_t>::max())
-                return Variant(static_cast<int16_t>(w->value));
-            if (w->value >= std::numeric_limits<int32_t>::min() && w->value <= std::numeric_limits<int32_t>::max())
-                return Variant(static_cast<int32_t>(w->value));
-        }
-    }
-    auto d = read_floating<double>(s);
-    if (!d) return std::nullopt;
-    return Variant(*d);
-}
-
-std::optional<int64_t> read_typed_whole(std::string_view s, int64_t min, int64_t max, std::size_t hex_digits) {
-    auto w = read_whole(s, hex_digits);
-    if (!w) return std::nullopt;
-    int64_t v = w->value;
-    if (w->hex) {
-        // A bit pattern of the kind's width: 0xFFFF is -1 as a 16-bit integer.
-        int64_t span = max - min + 1;
-        if (v > max) v -= span;
-    }
-    if (v < min || v > max) return std::nullopt;
-    return v;
-}
-
-std::optional<Date> read_date(std::string_view s) {
-    int parts[3] = {0, 0, 0};
-    std::size_t widths[3] = {0, 0, 0};
-    std::size_t field = 0;
-    for (char c : s) {
-        if (c == '-') {
-            if (++field > 2) return std::nullopt;
-            continue;
-        }
-        if (!is_digit(c)) return std::nullopt;
-        if (++widths[field] > 4) return std::nullopt;
-        parts[field] = parts[field] * 10 + (c - '0');
-    }
-    if (field != 2 || widths[0] == 0 || widths[1] == 0 || widths[1] > 2 || widths[2] == 0 || widths[2] > 2)
-        return std::nullopt;
-    return make_date(parts[0], parts[1], parts[2]);
-}
-
-Variant read_font(std::string_view word) {
-    std::string_view rest = word.substr(5);  // after "font:"
-    if (rest.empty() || rest[0] != '"') malformed_value(word);
-    std::size_t pos = 0;
-    std::string name = read_string(rest, pos, word);
-    rest = rest.substr(pos);
-    if (rest.empty() || rest[0] != ':') malformed_value(word);
-    rest = rest.substr(1);
-    std::size_t colon = rest.find(':');
-    auto size = read_floating<double>(rest.substr(0, colon));
-    if (!size || *size <= 0) malformed_value(word);
-    bool bold = false, italic = false;
-    while (colon != std::string_view::npos) {
-        rest = rest.substr(colon + 1);
-        colon = rest.find(':');
-        std::string_view flag = rest.substr(0, colon);
-        if (same_name(flag, "bold") && !bold)
-            bold = true;
-        else if (same_name(flag, "italic") && !italic)
-            italic = true;
-        else
-            malformed_value(word);
-    }
-    return Variant(std::make_shared<Font>(std::move(name), *size, bold, italic));
+    return (c >= '0' && c <= '9') || (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z') || c == '_';
 }
 
 void append_hex(std::string& out, unsigned char c) {
@@ -238,82 +27,46 @@ void append_hex(std::string& out, unsigned char c) {
     out += kDigits[c & 0xF];
 }
 
+// The literals are the host's (keltext/host/value_literal.h); a malformed one is the script's mistake.
+template <class F>
+auto as_script_error(F&& f) -> decltype(f()) {
+    try {
+        return f();
+    } catch (const ValueLiteralError& e) {
+        throw ScriptError(e.what());
+    }
+}
+
 }  // namespace
 
 std::vector<std::string_view> split_words(std::string_view line) {
-    std::vector<std::string_view> words;
-    std::size_t i = 0;
-    while (i < line.size()) {
-        while (i < line.size() && is_blank(line[i])) ++i;
-        if (i >= line.size() || line[i] == '#') break;
-        std::size_t start = i;
-        bool comment = false;
-        while (i < line.size() && !is_blank(line[i])) {
-            char c = line[i];
-            if (c == '#') {
-                comment = true;
-                break;
-            }
-            if (c != '"') {
-                ++i;
-                continue;
-            }
-            ++i;
-            while (i < line.size() && line[i] != '"') i += (line[i] == '\\') ? 2 : 1;
-            if (i >= line.size())
-                throw ScriptError("malformed string '" + shown(line.substr(start)) + "': no closing quote");
-            ++i;
-        }
-        words.push_back(line.substr(start, i - start));
-        if (comment) break;
-    }
-    return words;
+    return as_script_error([&] { return kel::split_words(line); });
 }
 
-bool is_string_literal(std::string_view word) { return !word.empty() && word[0] == '"'; }
+bool is_string_literal(std::string_view word) { return kel::is_string_literal(word); }
 
 std::string decode_string(std::string_view word) {
-    if (!is_string_literal(word)) throw ScriptError("expected a quoted string, got '" + shown(word) + "'");
-    std::size_t pos = 0;
-    std::string s = read_string(word, pos, word);
-    if (pos != word.size()) throw ScriptError("malformed string '" + shown(word) + "': text after the closing quote");
-    return s;
+    return as_script_error([&] { return kel::decode_string(word); });
 }
 
 Variant parse_value(std::string_view word) {
-    if (word.empty()) malformed_value(word);
-    if (word[0] == '"') return Variant(decode_string(word));
-    if (same_name(word, "empty")) return Variant();
-    if (same_name(word, "true")) return Variant(true);
-    if (same_name(word, "false")) return Variant(false);
-    if (auto n = read_number(word)) return *n;
-    if (starts_with_name(word, "u8:")) {
-        if (auto v = read_typed_whole(word.substr(3), 0, 255, 2)) return Variant(static_cast<uint8_t>(*v));
-    } else if (starts_with_name(word, "i16:")) {
-        if (auto v = read_typed_whole(word.substr(4), std::numeric_limits<int16_t>::min(),
-                                      std::numeric_limits<int16_t>::max(), 4))
-            return Variant(static_cast<int16_t>(*v));
-    } else if (starts_with_name(word, "i32:")) {
-        if (auto v = read_typed_whole(word.substr(4), std::numeric_limits<int32_t>::min(),
-                                      std::numeric_limits<int32_t>::max(), 8))
-            return Variant(static_cast<int32_t>(*v));
-    } else if (starts_with_name(word, "f32:")) {
-        if (auto v = read_floating<float>(word.substr(4))) return Variant(*v);
-    } else if (starts_with_name(word, "f64:")) {
-        if (auto v = read_floating<double>(word.substr(4))) return Variant(*v);
-    } else if (starts_with_name(word, "date:")) {
-        if (auto d = read_date(word.substr(5))) return Variant(*d);
-    } else if (starts_with_name(word, "font:")) {
-        return read_font(word);
-    }
-    malformed_value(word);
+    return as_script_error([&] { return kel::parse_value(word); });
 }
 
 Expected parse_expected(std::string_view word) {
     if (starts_with_name(word, "error:")) {
-        auto w = read_whole(word.substr(6), 0);
-        if (!w || w->value < 0 || w->value > std::numeric_limits<int32_t>::max()) malformed_value(word);
-        return Expected{Variant(), static_cast<int>(w->value)};
+        // A run-time error number: plain decimal digits, 0 to the largest 32-bit integer.
+        const std::string_view digits = word.substr(6);
+        const bool decimal = !digits.empty() && digits.find_first_not_of("+-0123456789") == std::string_view::npos;
+        Variant n;
+        try {
+            if (decimal) n = kel::parse_value(digits);
+        } catch (const ValueLiteralError&) {
+            n = Variant();
+        }
+        if (!(n.kind() == VarKind::Int16 || n.kind() == VarKind::Int32) || n.number() < 0)
+            throw ScriptError("malformed value '" + shown(word) + "'");
+        return Expected{Variant(), static_cast<int>(n.number())};
     }
     return Expected{parse_value(word), std::nullopt};
 }
@@ -412,18 +165,6 @@ Target parse_target(std::string_view word) {
     return t;
 }
 
-std::string shown(std::string_view word) {
-    constexpr std::size_t kLongest = 80;
-    std::string out;
-    for (std::size_t i = 0; i < word.size() && i < kLongest; ++i) {
-        auto u = static_cast<unsigned char>(word[i]);
-        if (u < 0x20 || u >= 0x7F)
-            append_hex(out, u);
-        else
-            out += word[i];
-    }
-    if (word.size() > kLongest) out += "...";
-    return out;
-}
+std::string shown(std::string_view word) { return shown_word(word); }
 
 }  // namespace kel::kelform

@@ -292,7 +292,9 @@ HostedControl& Form::open_page(const ClassInfo& page_class, std::string name, st
     if (!page_class.is_page) throw FormError(page_class.name + " is not a property page");
     for (HostedControl* c : selected) {
         if (!c) throw FormError("a page needs controls to edit");
-        if (impl_->site_of(*c).is_page()) throw FormError("a page cannot edit a page");
+        // The controls may stand on another host's form: a page edits them through their
+        // member tables alone.
+        if (c->info().is_page) throw FormError("a page cannot edit a page");
     }
     MiniSite& s = impl_->add(page_class, std::move(name), 5925, 3495, std::move(selected));
     auto* page = dynamic_cast<PropertyPage*>(&s.control());

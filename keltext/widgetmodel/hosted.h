@@ -142,6 +142,13 @@ public:
 
     // Delivers queued synthetic keystrokes, and those they queue, in order.
     virtual void run_pending() = 0;
+
+    // For a host that shows the models in views of its own. The driver changed members
+    // directly (a property, a part's member, a method): the views catch up with the models.
+    virtual void members_changed() {}
+    // The views of `control` show what its models hold; FormError naming the difference when
+    // they do not.
+    virtual void check_views(HostedControl& /*control*/) {}
 };
 
 }  // namespace kel::model

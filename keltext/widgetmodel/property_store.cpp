@@ -1,11 +1,11 @@
-#include "keltext/minihost/property_store.h"
+#include "keltext/widgetmodel/property_store.h"
 
 #include <cstddef>
 
 #include "keltext/host/conversions.h"
 #include "keltext/host/font.h"
 
-namespace kel::mini {
+namespace kel::model {
 namespace {
 
 bool counts_as_number(const Variant& v) {
@@ -68,4 +68,4 @@ void PropertyStore::write(std::string_view key, const Variant& value, const Vari
     }
 }
 
-}  // namespace kel::mini
+}  // namespace kel::model
