@@ -8,6 +8,17 @@ install(TARGETS ${KELTEXT_EXPORTED_TARGETS} EXPORT KelTextTargets
   ARCHIVE DESTINATION ${CMAKE_INSTALL_LIBDIR} COMPONENT development
   LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR} COMPONENT development)
 install(EXPORT KelTextTargets NAMESPACE keltext:: DESTINATION ${KELTEXT_CMAKE_DIR} COMPONENT development)
+# The Qt host: find_package(KelText COMPONENTS Qt) gives keltext::qt and finds Qt 6 Widgets.
+if(TARGET keltext_qt)
+  set(KELTEXT_HAS_QT ON)
+  install(TARGETS keltext_qt EXPORT KelTextQtTargets
+    ARCHIVE DESTINATION ${CMAKE_INSTALL_LIBDIR} COMPONENT development
+    LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR} COMPONENT development
+    RUNTIME DESTINATION ${CMAKE_INSTALL_BINDIR} COMPONENT development)
+  install(EXPORT KelTextQtTargets NAMESPACE keltext:: DESTINATION ${KELTEXT_CMAKE_DIR} COMPONENT development)
+else()
+  set(KELTEXT_HAS_QT OFF)
+endif()
 configure_package_config_file(${PROJECT_SOURCE_DIR}/cmake/KelTextConfig.cmake.in
   ${PROJECT_BINARY_DIR}/KelTextConfig.cmake
   INSTALL_DESTINATION ${KELTEXT_CMAKE_DIR})

@@ -196,8 +196,8 @@ void ControlWidget::report_text(const char* message) {
 
 QSize ControlWidget::sizeHint() const {
     if (!site_) return {};
-    auto& s = const_cast<QtSite&>(*site_);
-    return {s.to_pixels(s.surface_model().Width()), s.to_pixels(s.surface_model().Height())};
+    const model::SurfaceModel& surface = site_->surface_model();
+    return {site_->to_pixels(surface.Width()), site_->to_pixels(surface.Height())};
 }
 
 void ControlWidget::emitEvent(int, std::span<EventArg>) {}
@@ -223,7 +223,13 @@ void ControlWidget::site_synced() {
         resize(px);
         updateGeometry();
     }
-    update();
+    const model::SurfaceModel& s = site_->surface_model();
+    if (s.BackColor() != shown_back_ || s.ForeColor() != shown_fore_ || s.BorderStyle() != shown_border_) {
+        shown_back_ = s.BackColor();
+        shown_fore_ = s.ForeColor();
+        shown_border_ = s.BorderStyle();
+        update();
+    }
 }
 
 void ControlWidget::resizeEvent(QResizeEvent* e) {

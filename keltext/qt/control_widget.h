@@ -15,7 +15,8 @@
 // Events reach, in order: the wrapper's typed signal (by-reference arguments: a slot may set
 // keyAscii to 0), the generic kelEvent signal (arguments as a QVariantList a slot may change),
 // then the services' observer (a form driver). Connect with Qt::DirectConnection (the
-// default within one thread): a queued slot could not change an argument.
+// default within one thread): a queued slot could not change an argument. A slot that does
+// away with the control it hears from uses deleteLater(): the control is still running.
 #include <QString>
 #include <QVariantList>
 #include <QVariantMap>
@@ -76,6 +77,7 @@ public:
     // The last run-time error of a typed accessor or method, cleared by none (0 when none).
     int lastError() const { return last_error_; }
 
+    // The surface's size at the logical DPI.
     QSize sizeHint() const override;
     QSize minimumSizeHint() const override { return sizeHint(); }
 
@@ -140,6 +142,9 @@ private:
     std::string name_;
     std::unique_ptr<QtSite> site_;
     QSize applied_;
+    // The surface as last painted: repainted only when it changes.
+    Colour shown_back_ = 0, shown_fore_ = 0;
+    int16_t shown_border_ = -1;
     int last_error_ = 0;
 };
 

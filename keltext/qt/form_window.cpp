@@ -154,6 +154,15 @@ void FormWindow::tab(bool forward) {
     services_.after_input();
 }
 
+void FormWindow::select(model::HostedControl& control, int32_t start, int32_t length) {
+    QtSite& s = site_of(control);
+    model::InputPart* p = s.keyboard_input();
+    if (!p) throw model::FormError(control.name() + " has no edit field");
+    services_.run_pending();
+    p->user_select(start, length);
+    services_.after_input();
+}
+
 void FormWindow::set_insert(bool on) { services_.set_insert(on); }
 bool FormWindow::insert_on() const { return services_.insert_on(); }
 void FormWindow::set_clipboard(std::string_view text) { services_.clipboard().set_text(text); }

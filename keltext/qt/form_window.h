@@ -64,6 +64,9 @@ public:
     // nothing focused, the first (or last) control that can take focus.
     void tab(bool forward);
 
+    // The person sets the caret and selection of the control's edit field.
+    void select(model::HostedControl& control, int32_t start, int32_t length);
+
     void set_insert(bool on);
     bool insert_on() const;
     // The system clipboard (Windows-1252 text), as the edit fields see it.

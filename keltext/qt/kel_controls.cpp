@@ -16,6 +16,12 @@ QFont qfont_value(const kel::Variant& v) {
 
 std::string cp1252_value(const QString& s) { return kel::from_utf8(s.toStdString()); }
 
+// An index as form code writes it: a 16-bit integer where it fits (the list takes no other).
+kel::Variant index_value(int i) {
+    if (i >= -32768 && i <= 32767) return kel::Variant(static_cast<int16_t>(i));
+    return kel::Variant(static_cast<int32_t>(i));
+}
+
 }  // namespace
 
 // ---- KelAlphaNumeric
@@ -719,30 +725,30 @@ int KelCombo::NewIndex() {
     return reporting([&] { return static_cast<int>(kel::to_int32(getMember("NewIndex"))); });
 }
 
-QVariant KelCombo::List(const QVariant& index) {
+QVariant KelCombo::List(int index) {
     return reporting([&] {
-        const kel::Variant i = variant_of(index);
+        const kel::Variant i = index_value(index);
         return qvariant_of(getMember("List", &i));
     });
 }
 
-void KelCombo::setList(const QVariant& index, const QVariant& value) {
+void KelCombo::setList(int index, const QVariant& value) {
     reporting([&] {
-        const kel::Variant i = variant_of(index);
+        const kel::Variant i = index_value(index);
         putMember("List", variant_of(value), &i);
     });
 }
 
-QVariant KelCombo::ItemData(const QVariant& index) {
+QVariant KelCombo::ItemData(int index) {
     return reporting([&] {
-        const kel::Variant i = variant_of(index);
+        const kel::Variant i = index_value(index);
         return qvariant_of(getMember("ItemData", &i));
     });
 }
 
-void KelCombo::setItemData(const QVariant& index, const QVariant& value) {
+void KelCombo::setItemData(int index, const QVariant& value) {
     reporting([&] {
-        const kel::Variant i = variant_of(index);
+        const kel::Variant i = index_value(index);
         putMember("ItemData", variant_of(value), &i);
     });
 }

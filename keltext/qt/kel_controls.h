@@ -287,10 +287,10 @@ public:
     void setListIndex(int value);
     int ListCount();
     int NewIndex();
-    Q_INVOKABLE QVariant List(const QVariant& index);
-    Q_INVOKABLE void setList(const QVariant& index, const QVariant& value);
-    Q_INVOKABLE QVariant ItemData(const QVariant& index);
-    Q_INVOKABLE void setItemData(const QVariant& index, const QVariant& value);
+    Q_INVOKABLE QVariant List(int index);
+    Q_INVOKABLE void setList(int index, const QVariant& value);
+    Q_INVOKABLE QVariant ItemData(int index);
+    Q_INVOKABLE void setItemData(int index, const QVariant& value);
     QString FillList();
     void setFillList(const QString& value);
     int MaxLength();

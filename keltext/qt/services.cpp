@@ -186,6 +186,31 @@ void Services::SystemClipboard::set_text(std::string_view text) {
     QGuiApplication::clipboard()->setText(qstring_of(std::string(text)));
 }
 
+void Services::key_down(QtSite& site, int16_t key_code, int16_t shift) {
+    run_pending();
+    if (model::toggles_insert(key_code, shift)) insert_ = !insert_;
+    if (auto* p = site.input_target()) p->user_key_down(key_code, shift);
+    after_input();
+}
+
+void Services::key_press(QtSite& site, int16_t char_code) {
+    run_pending();
+    if (auto* p = site.input_target()) p->user_key_press(char_code);
+    after_input();
+}
+
+void Services::key_up(QtSite& site, int16_t key_code, int16_t shift) {
+    run_pending();
+    if (auto* p = site.input_target()) p->user_key_up(key_code, shift);
+    after_input();
+}
+
+void Services::paste(QtSite& site, std::string_view cp1252) {
+    run_pending();
+    if (auto* p = site.input_target()) p->user_paste(cp1252);
+    after_input();
+}
+
 bool Services::route_shortcut_override(QtSite&, QKeyEvent* e) {
     // Keys the controls take must not trigger an application's shortcuts (Ctrl+C, Delete);
     // function keys and Alt combinations stay the application's.
@@ -225,9 +250,10 @@ bool Services::route_key_release(QtSite& site, QKeyEvent* e) {
     return true;
 }
 
-void Services::route_focus_in(QtSite& site, QFocusEvent* e) {
+void Services::route_focus_in(QtSite& site, QFocusEvent*) {
+    // Whatever the reason, focus is in this control now; only a control that had it already
+    // (back from a popup or another window) enters nothing.
     if (focused_ == &site) return;
-    (void)e;  // whatever the reason, focus is in this control now
     set_control_focus(&site);
     after_input();
 }

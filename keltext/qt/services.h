@@ -3,19 +3,25 @@
 // control has focus as the controls see it, the handler depth shared by all controls, the
 // class catalogue, and the routing of Qt's input events into the widget models.
 //
-// One object per application, a child of the QCoreApplication (Services::of finds or makes
+// One object per application, a child of the QCoreApplication (of_application finds or makes
 // it), so that the application and a Designer plugin share it through the one shared library.
 //
 // Internal API for a form driver (kelform's Qt player, tests):
 //   - set_observer(model::FormObserver*): events raised (with mutable arguments), keys sent,
 //     properties changed, handler errors and refused focus reach the driver, as on the
 //     minimal host. Without an observer, events go only to the wrappers' signals.
-//   - run_pending(): delivers queued send-keys now (the views do it after each user action).
+//   - run_pending(): delivers queued send-keys now (the views do it after each user action);
+//     after_input(): that, then sync_all().
 //   - set_insert / insert_on: the Insert toggle.
 //   - focused(): the control that has focus as the controls see it (popup menus and window
 //     activation do not change it).
 //   - tab(forward): the form's Tab, through Qt focus.
 //   - sync_all(): brings every view in line with its model (after a driver poked a part).
+//   - key_down / key_press / key_up / paste(site, ...): input with no faithful Qt event, to the
+//     model directly as the minimal form delivers it.
+//   - clipboard(): the clipboard the edit fields' clipboard keys use (the system's).
+// Clicks and notifications on a constituent: deliver_click / deliver_notification (views.h),
+// or QTest mouse events on QtSite::view_of(part).
 #include <QObject>
 #include <QPointer>
 #include <cstdint>
@@ -82,6 +88,15 @@ public:
     // Sites register themselves for the sync after each delivered event.
     void add_site(QtSite* site);
     void remove_site(QtSite* site);
+
+    // A lone key down, key press or key up, straight to the control's edit field (input with no
+    // faithful Qt event: a driver's `keydown`, `keypress`, `keyup`), as the minimal form
+    // delivers it; then the keys it queued. Key down flips the Insert toggle as the key does.
+    void key_down(QtSite& site, int16_t key_code, int16_t shift);
+    void key_press(QtSite& site, int16_t char_code);
+    void key_up(QtSite& site, int16_t key_code, int16_t shift);
+    // Text put into the control's edit field as a paste (Windows-1252).
+    void paste(QtSite& site, std::string_view cp1252);
 
     // The views hand their input events here. True when the event was the host's (the view
     // does nothing more with it).

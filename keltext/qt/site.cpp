@@ -196,6 +196,13 @@ QWidget* QtSite::view_of(const model::Part& part) {
     return nullptr;
 }
 
+std::optional<std::string> QtSite::shown_text(const model::Part& part) {
+    QWidget* w = view_of(part);
+    if (auto* combo = qobject_cast<ComboView*>(w)) return combo->edit().shown_text();
+    if (auto* edit = qobject_cast<EditFieldView*>(w)) return edit->shown_text();
+    return std::nullopt;
+}
+
 model::InputPart* QtSite::input_target() {
     model::InputPart* p = keyboard_part_;
     if (!p || !surface_.Enabled() || !p->input_enabled()) return nullptr;

@@ -14,6 +14,7 @@
 #include <QPointer>
 #include <QWidget>
 #include <memory>
+#include <optional>
 #include <string>
 #include <string_view>
 #include <utility>
@@ -104,7 +105,11 @@ public:
     QWidget& container() { return container_; }
     QWidget* view_of(const model::Part& part);
     QWidget* focus_view() { return focus_view_; }
+    // The text the Qt view of an edit-field part shows (Windows-1252), to check against its
+    // model; nothing for a part without a text view.
+    std::optional<std::string> shown_text(const model::Part& part);
     model::SurfaceModel& surface_model() { return surface_; }
+    const model::SurfaceModel& surface_model() const { return surface_; }
     model::InputPart* keyboard_input() { return keyboard_part_; }
     model::InputPart* input_part(model::Part* p);
     // The part whose view is `w`, or null.

@@ -50,19 +50,21 @@ void sync_widget(QWidget& view, const Widget& model, const QtSite& site) {
     if (view.isVisibleTo(view.parentWidget()) != model.Visible()) view.setVisible(model.Visible());
 }
 
-void sync_text_style(QWidget& view, const TextWidget& model) {
-    if (const auto f = model.Font()) {
-        const QFont q = qfont_of(*f);
-        if (view.font() != q) view.setFont(q);
+void sync_text_style(QWidget& view, const TextWidget& model, ShownStyle& shown) {
+    const auto f = model.Font();
+    if (f && (!shown.set || !shown.font.same_as(*f))) {
+        view.setFont(qfont_of(*f));
+        shown.font = *f;
     }
-    const QColor back = qcolor_of(model.BackColor());
-    const QColor fore = qcolor_of(model.ForeColor());
-    QPalette p = view.palette();
-    if (p.color(QPalette::Base) != back || p.color(QPalette::Text) != fore) {
-        p.setColor(QPalette::Base, back);
-        p.setColor(QPalette::Text, fore);
+    if (!shown.set || shown.fore != model.ForeColor() || shown.back != model.BackColor()) {
+        QPalette p = view.palette();
+        p.setColor(QPalette::Base, qcolor_of(model.BackColor()));
+        p.setColor(QPalette::Text, qcolor_of(model.ForeColor()));
         view.setPalette(p);
+        shown.fore = model.ForeColor();
+        shown.back = model.BackColor();
     }
+    shown.set = true;
 }
 
 void deliver_click(QtSite& site, model::InputPart& part) {
@@ -100,7 +102,7 @@ void EditFieldView::sync_text() {
     const int start = field_.SelStart();
     const int length = field_.SelLength();
     if (length > 0) {
-        if (selectionStart() != start || selectedText().size() != length || cursorPosition() != start + length)
+        if (selectionStart() != start || selectionLength() != length || cursorPosition() != start + length)
             setSelection(start, length);
     } else if (hasSelectedText() || cursorPosition() != start) {
         setCursorPosition(start);
@@ -110,7 +112,7 @@ void EditFieldView::sync_text() {
 void EditFieldView::sync() {
     if (!in_combo_) {
         sync_widget(*this, field_, site_);
-        sync_text_style(*this, field_);
+        sync_text_style(*this, field_, style_);
     }
     sync_text();
 }
@@ -243,7 +245,7 @@ ComboView::ComboView(QtSite& site, model::ComboBoxModel& combo, QWidget* parent)
 
 void ComboView::sync() {
     sync_widget(*this, combo_, site_);
-    sync_text_style(*edit_, combo_);
+    sync_text_style(*edit_, combo_, style_);
     edit_->sync_text();
 }
 
@@ -252,9 +254,17 @@ bool ComboView::event(QEvent* e) {
     switch (e->type()) {
     case QEvent::ShortcutOverride:
         return s.route_shortcut_override(site_, static_cast<QKeyEvent*>(e));
-    case QEvent::KeyPress:
-        s.route_key_press(site_, static_cast<QKeyEvent*>(e));
+    case QEvent::KeyPress: {
+        auto* k = static_cast<QKeyEvent*>(e);
+        s.route_key_press(site_, k);
+        // After the control had the key, F4 and Alt+Down or Alt+Up open the list, as the
+        // terminal form does.
+        const bool alt = k->modifiers() == Qt::AltModifier;
+        if ((k->key() == Qt::Key_F4 && k->modifiers() == Qt::NoModifier) ||
+            (alt && (k->key() == Qt::Key_Down || k->key() == Qt::Key_Up)))
+            showPopup();
         return true;
+    }
     case QEvent::KeyRelease:
         s.route_key_release(site_, static_cast<QKeyEvent*>(e));
         return true;
@@ -288,14 +298,19 @@ void ComboView::showPopup() {
         popup_ = new QListWidget(this);
         popup_->setWindowFlags(Qt::Popup);
         popup_->setFocusPolicy(Qt::NoFocus);
-        connect(popup_, &QListWidget::itemClicked, this, [this](QListWidgetItem* item) {
+        const auto pick = [this](QListWidgetItem* item) {
+            // Styles that activate on a single click send both signals for one click.
+            if (!popup_->isVisible()) return;
             const int row = popup_->row(item);
             popup_->hide();
             site_.services().run_pending();
             if (row >= 0 && row < combo_.ListCount() && takes_input(site_, combo_))
                 site_.guarded(combo_.part_name(), "Click", [&] { combo_.ListIndex(row); });
             site_.services().after_input();
-        });
+        };
+        // A click on an entry, or Enter on the one the arrow keys reached.
+        connect(popup_, &QListWidget::itemClicked, this, pick);
+        connect(popup_, &QListWidget::itemActivated, this, pick);
     }
     popup_->clear();
     std::string scratch;

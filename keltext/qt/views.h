@@ -23,8 +23,15 @@ namespace kel::qt {
 
 // Geometry, visibility and font of a view from its model (twips to pixels at the site's DPI).
 void sync_widget(QWidget& view, const Widget& model, const QtSite& site);
-// Colours and font of a text widget.
-void sync_text_style(QWidget& view, const TextWidget& model);
+// What a view last took of its model's font and colours: a keystroke changes neither, and
+// building a QFont and a palette for every key would cost more than the key.
+struct ShownStyle {
+    bool set = false;
+    kel::Font font;
+    Colour fore = 0, back = 0;
+};
+// Colours and font of a text widget, when they changed.
+void sync_text_style(QWidget& view, const TextWidget& model, ShownStyle& shown);
 
 // A QLineEdit that only shows an edit-field model: the edit box, the masked edit box and the
 // combo's edit field.
@@ -55,6 +62,7 @@ private:
     EditField& field_;
     model::InputPart& input_;
     bool in_combo_;
+    ShownStyle style_;
     int drag_anchor_ = -1;
 };
 
@@ -78,6 +86,7 @@ private:
     QtSite& site_;
     model::ComboBoxModel& combo_;
     EditFieldView* edit_;
+    ShownStyle style_;
     QListWidget* popup_ = nullptr;
 };
 

@@ -164,9 +164,9 @@ std::string header(const kel::Catalogue& catalogue) {
         o << "    " << cls.name << "(const Creation& creation, QWidget* parent);\n\n";
         for (const auto& p : cls.properties) {
             if (p.indexed) {
-                o << "    Q_INVOKABLE QVariant " << p.name << "(const QVariant& index);\n";
+                o << "    Q_INVOKABLE QVariant " << p.name << "(int index);\n";
                 if (!p.read_only())
-                    o << "    Q_INVOKABLE void " << setter_name(p.name) << "(const QVariant& index, const QVariant& value);\n";
+                    o << "    Q_INVOKABLE void " << setter_name(p.name) << "(int index, const QVariant& value);\n";
                 continue;
             }
             const Prop q = prop_of(cls, p);
@@ -206,6 +206,10 @@ std::string source(const kel::Catalogue& catalogue) {
          "QFont qfont_value(const kel::Variant& v) {\n"
          "    const auto f = kel::font_of(v);\n    return f ? qfont_of(*f) : QFont();\n}\n\n"
          "std::string cp1252_value(const QString& s) { return kel::from_utf8(s.toStdString()); }\n\n"
+         "// An index as form code writes it: a 16-bit integer where it fits (the list takes no other).\n"
+         "kel::Variant index_value(int i) {\n"
+         "    if (i >= -32768 && i <= 32767) return kel::Variant(static_cast<int16_t>(i));\n"
+         "    return kel::Variant(static_cast<int32_t>(i));\n}\n\n"
          "}  // namespace\n";
     for (const auto& cls : catalogue.classes()) {
         if (!is_wrapped(cls)) continue;
@@ -216,13 +220,13 @@ std::string source(const kel::Catalogue& catalogue) {
         o << c << "::" << c << "(const Creation& creation, QWidget* parent) : ControlWidget(creation, parent) {}\n";
         for (const auto& p : cls.properties) {
             if (p.indexed) {
-                o << "\nQVariant " << c << "::" << p.name << "(const QVariant& index) {\n"
-                  << "    return reporting([&] {\n        const kel::Variant i = variant_of(index);\n"
+                o << "\nQVariant " << c << "::" << p.name << "(int index) {\n"
+                  << "    return reporting([&] {\n        const kel::Variant i = index_value(index);\n"
                   << "        return qvariant_of(getMember(\"" << p.name << "\", &i));\n    });\n}\n";
                 if (!p.read_only())
                     o << "\nvoid " << c << "::" << setter_name(p.name)
-                      << "(const QVariant& index, const QVariant& value) {\n"
-                      << "    reporting([&] {\n        const kel::Variant i = variant_of(index);\n"
+                      << "(int index, const QVariant& value) {\n"
+                      << "    reporting([&] {\n        const kel::Variant i = index_value(index);\n"
                       << "        putMember(\"" << p.name << "\", variant_of(value), &i);\n    });\n}\n";
                 continue;
             }

@@ -3,7 +3,9 @@
 #   find_package  configures, builds and runs the application in APP against that prefix
 #   pkg_config    builds the same application with the flags keltext.pc gives, and compiles a
 #                 file that includes every installed header (a public header that includes one
-#                 that is not installed fails here)
+#                 that is not installed fails here; the Qt host's headers need Qt's flags and
+#                 are compiled by the qt step)
+#   qt            configures, builds and runs the Qt application in APP_QT offscreen
 set(prefix ${WORK}/prefix)
 function(run)
   execute_process(COMMAND ${ARGN} RESULT_VARIABLE rc OUTPUT_VARIABLE out ERROR_VARIABLE err)
@@ -42,12 +44,20 @@ elseif(STEP STREQUAL "pkg_config")
   run(${app}/consumer)
 
   file(GLOB_RECURSE headers RELATIVE ${prefix}/include ${prefix}/include/keltext/*.h)
+  list(FILTER headers EXCLUDE REGEX "^keltext/qt/")
   set(all "")
   foreach(h ${headers})
     string(APPEND all "#include \"${h}\"\n")
   endforeach()
   file(WRITE ${app}/all_headers.cpp "${all}")
   run(${CXX} -std=c++20 -fsyntax-only ${cflags} ${app}/all_headers.cpp)
+elseif(STEP STREQUAL "qt")
+  set(app ${WORK}/qt)
+  file(REMOVE_RECURSE ${app})
+  run(${CMAKE_COMMAND} -S ${APP_QT} -B ${app} -G ${GENERATOR} -DCMAKE_CXX_COMPILER=${CXX} -DCMAKE_PREFIX_PATH=${prefix})
+  run(${CMAKE_COMMAND} --build ${app})
+  set(ENV{QT_QPA_PLATFORM} offscreen)
+  run(${app}/consumer_qt)
 else()
   message(FATAL_ERROR "unknown STEP '${STEP}'")
 endif()
