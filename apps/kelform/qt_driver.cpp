@@ -141,11 +141,9 @@ void QtFormDriver::keystroke(const model::Keystroke& k) {
     // own pairing of key and character) has no faithful Qt event: it goes to the model.
     const qt::QtKeystroke made = qt::keystroke_from_qt(qt_key, mods, text);
     if (made.kind != qt::QtKeystroke::Kind::keystroke || !(made.key == k)) {
-        to_model([&] {
-            key_down(k.key_code, k.shift);
-            if (k.char_code) key_press(*k.char_code);
-            key_up(k.key_code, k.shift);
-        });
+        key_down(k.key_code, k.shift);
+        if (k.char_code) key_press(*k.char_code);
+        key_up(k.key_code, k.shift);
         return;
     }
     QWidget* target = QApplication::focusWidget();
@@ -162,52 +160,24 @@ void QtFormDriver::type(std::string_view text) {
     for (char c : text) keystroke(model::keystroke_for_char(static_cast<uint8_t>(c)));
 }
 
-template <class F>
-void QtFormDriver::to_model(F&& f) {
-    f();
-    window_.services().after_input();
-}
-
 // A lone half of a keystroke has no Qt event of its own (a Qt key press is key down and key
 // press together): the model takes it, as the minimal host delivers it.
 void QtFormDriver::key_down(int16_t key_code, int16_t shift) {
-    qt::QtSite& site = focused_site();
-    to_model([&] {
-        if (model::toggles_insert(key_code, shift)) window_.set_insert(!window_.insert_on());
-        if (model::InputPart* p = site.input_target()) p->user_key_down(key_code, shift);
-    });
+    window_.services().key_down(focused_site(), key_code, shift);
 }
-
-void QtFormDriver::key_press(int16_t char_code) {
-    qt::QtSite& site = focused_site();
-    to_model([&] {
-        if (model::InputPart* p = site.input_target()) p->user_key_press(char_code);
-    });
-}
-
+void QtFormDriver::key_press(int16_t char_code) { window_.services().key_press(focused_site(), char_code); }
 void QtFormDriver::key_up(int16_t key_code, int16_t shift) {
-    qt::QtSite& site = focused_site();
-    to_model([&] {
-        if (model::InputPart* p = site.input_target()) p->user_key_up(key_code, shift);
-    });
+    window_.services().key_up(focused_site(), key_code, shift);
 }
 
 // The script's paste names its text, which no Qt event carries (Ctrl+V takes the clipboard's):
 // the model takes it, as the paste path of the view hands it on.
-void QtFormDriver::paste(std::string_view text) {
-    qt::QtSite& site = focused_site();
-    to_model([&] {
-        if (model::InputPart* p = site.input_target()) p->user_paste(text);
-    });
-}
+void QtFormDriver::paste(std::string_view text) { window_.services().paste(focused_site(), text); }
 
 // A selection set by the script (a person's drag, in effect) goes to the model: a drag in
 // pixels would land on character boundaries the font decides.
 void QtFormDriver::select(model::HostedControl& control, int32_t start, int32_t length) {
-    qt::QtSite& site = window_.site_of(control);
-    model::InputPart* p = site.keyboard_input();
-    if (!p) throw model::FormError(control.name() + " has no edit field");
-    to_model([&] { p->user_select(start, length); });
+    window_.select(control, start, length);
 }
 
 void QtFormDriver::set_insert(bool on) { window_.set_insert(on); }
@@ -233,12 +203,7 @@ void QtFormDriver::click(model::HostedControl& control, model::Part& part) {
     QWidget* view = site.view_of(part);
     // A click on an edit field also puts the caret where it lands, which the script's click
     // does not say; a hidden view cannot be clicked. Those clicks go to the model.
-    if (p.is_edit_field() || !view || !view->isVisible()) {
-        to_model([&] {
-            if (takes_input(site, p)) p.user_click();
-        });
-        return;
-    }
+    if (p.is_edit_field() || !view || !view->isVisible()) return qt::deliver_click(site, p);
     QTest::mouseClick(view, Qt::LeftButton);
     run_pending();
 }
@@ -248,9 +213,7 @@ void QtFormDriver::dbl_click(model::HostedControl& control, model::Part& part) {
     model::InputPart& p = deliverable(site, part, "DblClick");
     // Qt makes a double click of two presses, each of them a click of its own: the
     // notification alone goes to the model.
-    to_model([&] {
-        if (takes_input(site, p)) p.user_notify("DblClick");
-    });
+    qt::deliver_notification(site, p, "DblClick");
 }
 
 void QtFormDriver::notify(model::HostedControl& control, model::Part& part, std::string_view notification) {
@@ -268,9 +231,7 @@ void QtFormDriver::notify(model::HostedControl& control, model::Part& part, std:
             return;
         }
     }
-    to_model([&] {
-        if (takes_input(site, p)) p.user_notify(name);
-    });
+    qt::deliver_notification(site, p, name);
 }
 
 // Mouse positions are twips; a Qt event at pixels would round them, and a real press on an
@@ -279,9 +240,9 @@ void QtFormDriver::mouse(model::HostedControl& control, model::Part& part, bool 
                          float x, float y) {
     qt::QtSite& site = any_site(control);
     model::InputPart& p = deliverable(site, part, down ? "MouseDown" : "MouseUp");
-    to_model([&] {
-        if (takes_input(site, p)) p.user_mouse(down, button, shift, x, y);
-    });
+    window_.services().run_pending();
+    if (takes_input(site, p)) p.user_mouse(down, button, shift, x, y);
+    window_.services().after_input();
 }
 
 void QtFormDriver::resize(model::HostedControl& control, float width, float height) {

@@ -76,9 +76,6 @@ private:
     // The input part of `part` that may take `notification`, as the minimal host checks it.
     model::InputPart& deliverable(qt::QtSite& site, model::Part& part, std::string_view notification);
     bool takes_input(qt::QtSite& site, model::InputPart& p);
-    // Delivers to the focused control's edit field straight to its model, then what it queued.
-    template <class F>
-    void to_model(F&& f);
 
     qt::FormWindow window_;
     // Property pages, on controls of the window; declared last, they go first.

@@ -10,6 +10,7 @@
 
 #include "keltext/host/charset.h"
 #include "keltext/host/conversions.h"
+#include "keltext/host/float_chars.h"
 #include "keltext/host/date.h"
 #include "keltext/host/float_chars.h"
 #include "keltext/host/font.h"
