@@ -58,7 +58,8 @@ void DesktopForm::lay_out() {
     const int line = fm.height() + 2;
     const auto x_of = [&](int col) { return 8 + (col - 1) * cell; };
     const auto y_of = [&](int row) { return 8 + (row - 1) * line; };
-    int right = 320, bottom = 0;
+    // Wide enough for the status line's longer messages.
+    int right = 80 * cell, bottom = 0;
     for (const SavedControl& c : saved_.controls) {
         model::HostedControl* hosted = driver_.find(c.name);
         if (!hosted) continue;
