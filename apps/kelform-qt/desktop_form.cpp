@@ -192,7 +192,11 @@ void DesktopForm::open_calendar(model::HostedControl& control) {
 
 // The date box's rule after any input: a box left with a bad date gets focus back once.
 void DesktopForm::after_input(model::HostedControl* before) {
-    if (!before || !FormCode::keeps_focus(driver_, before)) return;
+    if (!before) return;
+    // The form tells the person when a box changed what they typed as they left it.
+    if (driver_.focused() != before && status_->text().isEmpty())
+        if (const auto changed = code_.left_status(*before, typed_)) say(*changed);
+    if (!FormCode::keeps_focus(driver_, before)) return;
     driver_.focus(before);
     say(code_.kept_focus_status(*before, status_->text().toStdString()));
 }
@@ -207,7 +211,10 @@ bool DesktopForm::eventFilter(QObject* watched, QEvent* event) {
         return QObject::eventFilter(watched, event);
     model::HostedControl* before = driver_.focused();
     // Each input starts with a clear status line: what it shows is about this input.
-    if (type != QEvent::KeyRelease) status_->clear();
+    if (type != QEvent::KeyRelease) {
+        status_->clear();
+        typed_ = before ? FormCode::edit_text(*before) : std::string();
+    }
     if (type == QEvent::KeyPress) {
         auto* key = static_cast<QKeyEvent*>(event);
         const Qt::KeyboardModifiers mods = key->modifiers() & ~Qt::KeypadModifier;

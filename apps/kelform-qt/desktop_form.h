@@ -64,6 +64,7 @@ private:
     QtFormDriver driver_;
     std::optional<std::string> record_path_;
     QLabel* status_ = nullptr;
+    std::string typed_;  // the focused field's text when the input began
     QPointer<QWidget> calendar_popup_;
     QCalendarWidget* calendar_ = nullptr;
 };

@@ -3,6 +3,7 @@
 #include <algorithm>
 
 #include "keltext/host/charset.h"
+#include "keltext/host/conversions.h"
 #include "keltext/host/date_recognizer.h"
 #include "keltext/host/errors.h"
 #include "keltext/host/members.h"
@@ -20,6 +21,47 @@ std::optional<Variant> control_property(model::HostedControl& control, std::stri
 bool is_class(const model::HostedControl& control, std::string_view name) {
     return same_name(control.info().name, name);
 }
+
+namespace {
+
+
+// The parts of a dd/mm/yyyy field as numbers, where they are typed in full.
+std::optional<int> date_part(std::string_view text, std::size_t at, std::size_t len) {
+    if (text.size() < at + len) return std::nullopt;
+    int v = 0;
+    for (char c : text.substr(at, len)) {
+        if (c < '0' || c > '9') return std::nullopt;
+        v = v * 10 + (c - '0');
+    }
+    return v;
+}
+
+// True when leaving the control changed the value typed (a number clamped, a date corrected),
+// not merely its form (grouping, padding, a two-digit year widened).
+bool value_changed(model::HostedControl& c, const std::string& before, const std::string& after) {
+    if (before.empty() || before == after) return false;
+    if (is_class(c, "KelNumeric")) {
+        std::string b = before, a = after;
+        std::erase(b, ',');
+        std::erase(a, ',');
+        return leading_value(b) != leading_value(a);
+    }
+    if (is_class(c, "KelDateMask")) {
+        const auto style = control_property(c, "DateStyle");
+        if (style && style->number() != 0) return false;
+        for (const std::size_t at : {std::size_t{0}, std::size_t{3}}) {
+            const auto b = date_part(before, at, 2), a = date_part(after, at, 2);
+            if (b && a && *b != *a) return true;
+        }
+        if (const auto b = date_part(before, 6, 4), a = date_part(after, 6, 4); b && a) return *b != *a;
+        if (const auto b = date_part(before, 6, 2), a = date_part(after, 6, 4); b && a) return *b != *a % 100;
+        return false;
+    }
+    return is_class(c, "KelAlphaNumeric");
+}
+
+}  // namespace
+
 
 FormCode::FormCode(const SavedForm& saved) : saved_(saved) {
     for (std::size_t i = 0; i < saved_.controls.size(); ++i) index_.try_emplace(name_key(saved_.controls[i].name), i);
@@ -54,6 +96,17 @@ std::optional<std::string> FormCode::event_status(model::HostedControl& control,
         return label_of(control) + ": not a real date (dd/mm/yyyy)";
     }
     return std::nullopt;
+}
+
+std::string FormCode::edit_text(model::HostedControl& control) {
+    const model::Part* edit = control.keyboard_part();
+    return edit ? edit->peek("Text").str() : std::string();
+}
+
+std::optional<std::string> FormCode::left_status(model::HostedControl& control, const std::string& typed) const {
+    const std::string now = edit_text(control);
+    if (!value_changed(control, typed, now)) return std::nullopt;
+    return label_of(control) + ": " + to_utf8(typed) + " was changed to " + to_utf8(now);
 }
 
 bool FormCode::opens_calendar(std::string_view event) { return same_name(event, "ButtonClick"); }

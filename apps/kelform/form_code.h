@@ -28,6 +28,12 @@ public:
 
     // The status line's message for an event the form answers (ControlError, DateError).
     std::optional<std::string> event_status(model::HostedControl& control, std::string_view event) const;
+    // What the control's edit field holds now.
+    static std::string edit_text(model::HostedControl& control);
+    // When leaving the control changed the value typed (`typed`: its text before the input that
+    // made focus leave), not merely its form (grouping, padding, a two-digit year widened):
+    // "Amount: 6000000 was changed to 5000000.00".
+    std::optional<std::string> left_status(model::HostedControl& control, const std::string& typed) const;
     // True for the event that opens the date box's calendar (its button was pressed).
     static bool opens_calendar(std::string_view event);
     static std::string handler_error_status(std::string_view where, int number);

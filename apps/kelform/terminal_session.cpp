@@ -216,60 +216,14 @@ bool TerminalSession::save_record() {
     return true;
 }
 
-namespace {
-
-std::string edit_text(HostedControl& c) {
-    const model::Part* edit = c.keyboard_part();
-    return edit ? edit->peek("Text").str() : std::string();
-}
-
-// The parts of a dd/mm/yyyy field as numbers, where they are typed in full.
-std::optional<int> date_part(std::string_view text, std::size_t at, std::size_t len) {
-    if (text.size() < at + len) return std::nullopt;
-    int v = 0;
-    for (char c : text.substr(at, len)) {
-        if (c < '0' || c > '9') return std::nullopt;
-        v = v * 10 + (c - '0');
-    }
-    return v;
-}
-
-// True when leaving the control changed the value typed (a number clamped, a date corrected),
-// not merely its form (grouping, padding, a two-digit year widened).
-bool value_changed(HostedControl& c, const std::string& before, const std::string& after) {
-    if (before.empty() || before == after) return false;
-    if (is_class(c, "KelNumeric")) {
-        std::string b = before, a = after;
-        std::erase(b, ',');
-        std::erase(a, ',');
-        return leading_value(b) != leading_value(a);
-    }
-    if (is_class(c, "KelDateMask")) {
-        const auto style = property(c, "DateStyle");
-        if (style && style->number() != 0) return false;
-        for (const std::size_t at : {std::size_t{0}, std::size_t{3}}) {
-            const auto b = date_part(before, at, 2), a = date_part(after, at, 2);
-            if (b && a && *b != *a) return true;
-        }
-        if (const auto b = date_part(before, 6, 4), a = date_part(after, 6, 4); b && a) return *b != *a;
-        if (const auto b = date_part(before, 6, 2), a = date_part(after, 6, 4); b && a) return *b != *a % 100;
-        return false;
-    }
-    return is_class(c, "KelAlphaNumeric");
-}
-
-}  // namespace
-
 TerminalSession::Outcome TerminalSession::handle(const Input& input) {
     HostedControl* editing = form_.focused();
-    const std::string typed = editing ? edit_text(*editing) : std::string();
+    const std::string typed = editing ? FormCode::edit_text(*editing) : std::string();
     left_field_ = false;
     const Outcome outcome = handle_input(input);
     // The form tells the person when a box changed what they typed as they left it.
     if (editing && (left_field_ || form_.focused() != editing) && status_.empty()) {
-        const std::string now = edit_text(*editing);
-        if (value_changed(*editing, typed, now))
-            say(label_of(*editing) + ": " + to_utf8(typed) + " was changed to " + to_utf8(now));
+        if (const auto changed = code_.left_status(*editing, typed)) say(*changed);
     }
     return outcome;
 }
