@@ -361,13 +361,17 @@ export class FormView {
   }
 
   // A month calendar under the field; days outside [min, max] cannot be picked. `onPick`
-  // receives the day as a Date.
+  // receives the day as a Date; when it returns false (the form does not take that day) the
+  // calendar stays open for another.
   openCalendar(name, { day, min, max, onPick }) {
     let shown = new Date(day.getFullYear(), day.getMonth(), 1);
     let current = new Date(day);
     const box = document.createElement('div');
     box.className = 'kelform-popup kelform-calendar';
     const inRange = (d) => (!min || d >= min) && (!max || d <= max);
+    const pick = (d) => {
+      if (onPick(d) !== false) this.closePopup();
+    };
     const render = () => {
       box.replaceChildren();
       const head = document.createElement('div');
@@ -398,7 +402,7 @@ export class FormView {
         b.disabled = !inRange(d);
         b.classList.toggle('current', d.getTime() === current.getTime());
         b.addEventListener('mousedown', (e) => e.preventDefault());
-        b.addEventListener('click', () => { this.closePopup(); onPick(d); });
+        b.addEventListener('click', () => pick(d));
         grid.append(b);
       }
       box.append(grid);
@@ -419,10 +423,7 @@ export class FormView {
         else if (e.key === 'PageUp') move(0, -1);
         else if (e.key === 'PageDown') move(0, 1);
         else if (e.key === 'Enter' || e.key === ' ') {
-          if (inRange(current)) {
-            this.closePopup();
-            onPick(current);
-          }
+          if (inRange(current)) pick(new Date(current));
         } else if (e.key === 'Escape') this.closePopup();
         else return false;
         return true;

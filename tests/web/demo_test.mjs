@@ -33,19 +33,26 @@ try {
   await page.goto(`${server.url}/index.html?today=2026-05-20`);
   await page.waitForSelector('body[data-ready="true"]', { timeout: 30000 });
   const value = (name) => page.inputValue(`#kelform-${name}`);
+  const status = () => page.textContent('.kelform-status');
+  const focused = () => page.evaluate(() => document.activeElement?.id);
 
-  check('focus starts on the first field', await page.evaluate(() => document.activeElement?.id), 'kelform-Payee');
+  check('focus starts on the first field', await focused(), 'kelform-Payee');
   await page.keyboard.type('ramesh kumar');
   check('title case as typed', await value('Payee'), 'Ramesh Kumar');
   await page.keyboard.press('Tab');
   await page.keyboard.type('abcde1234f');
   check('upper case', await value('PAN'), 'ABCDE1234F');
   await page.keyboard.press('Tab');
+  // The status line speaks the forms' code shared with the terminal and desktop forms.
+  await page.keyboard.type('x');
+  check('a letter refused, in the forms\' words', await status(), 'Amount: key refused - up to 8 digits, a point and 2 decimals');
   await page.keyboard.type('1234567.5');
   check('amount as typed', await value('Amount'), '1234567.5');
+  check('the next key clears the status line', await status(), '');
   await page.keyboard.press('Tab');
   check('amount grouped on Tab', await value('Amount'), '12,34,567.50');
-  check('focus follows the form', await page.evaluate(() => document.activeElement?.id), 'kelform-VoucherDate');
+  check('grouping is no change of value', await status(), '');
+  check('focus follows the form', await focused(), 'kelform-VoucherDate');
   check('date starts at today', await value('VoucherDate'), '20/05/2026');
   await page.keyboard.type('15/06/2026');
   await page.keyboard.press('Tab');
@@ -100,6 +107,25 @@ try {
   mkdirSync(outDir, { recursive: true });
   await page.screenshot({ path: join(outDir, 'voucher.png'), fullPage: true });
   console.log(`screenshot: ${join(outDir, 'voucher.png')}`);
+  // Month 13 is no period: F10 completes the field first, its DateError speaks and the box
+  // keeps focus once; leaving again is let through.
+  await page.click('#kelform-Period');
+  await page.keyboard.press('Home');
+  await page.keyboard.type('13');
+  check('a bad month typed', await value('Period'), '13/26_');
+  await page.keyboard.press('F10');
+  check('the bad period keeps focus', await focused(), 'kelform-Period');
+  check('and says why', await status(),
+        'Period: give a month 01-12 and a two-digit year (mm/yy) - focus stays; leave again to keep it');
+  await page.keyboard.press('Tab');
+  check('leaving again is let through (to the first field)', await focused(), 'kelform-Payee');
+  // Below the smallest cheque number: leaving clamps it, and the form says so.
+  await page.click('#kelform-ChequeNo');
+  await page.keyboard.press('End');
+  for (let i = 0; i < 6; ++i) await page.keyboard.press('Backspace');
+  await page.keyboard.type('12345');
+  await page.keyboard.press('Tab');
+  check('a clamped value is told', await status(), 'Cheque number: 12345 was changed to 100000');
 } finally {
   await browser.close();
   server.close();
