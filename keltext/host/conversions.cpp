@@ -464,4 +464,25 @@ std::optional<bool> stored_bool(const Variant& v) {
     return to_double(v) != 0;
 }
 
+// Which values convert is the conversions' own rule, so it is asked: 13 or 6 means the
+// form left a value that does not take the kind, and the control's value stands.
+Variant coerce_like(const Variant& value, const Variant& given) {
+    try {
+        switch (given.kind()) {
+        case VarKind::Byte: return to_byte(value);
+        case VarKind::Int16: return to_int16(value);
+        case VarKind::Int32: return to_int32(value);
+        case VarKind::Single: return to_single(value);
+        case VarKind::Double: return to_double(value);
+        case VarKind::Boolean: return to_bool(value);
+        case VarKind::String: return text_of(value);
+        case VarKind::Date: return value.kind() == VarKind::Date ? value : given;
+        case VarKind::Object: return value.is_object() ? value : given;
+        case VarKind::Empty: return value;
+        }
+    } catch (const RuntimeError&) {
+    }
+    return given;
+}
+
 }  // namespace kel

@@ -58,6 +58,10 @@ int32_t to_int32(double value);
 // Numbers: non-zero is true; text "True"/"False" (any case) or numeric text; else error 13.
 bool to_bool(const Variant& v);
 
+// A by-reference event argument the form's code changed, back in the kind the control gave
+// it (`given`); a value that does not convert to that kind leaves the control's value.
+Variant coerce_like(const Variant& value, const Variant& given);
+
 // Values read from a property store, where a value that does not convert is skipped (the
 // control keeps what it has) instead of failing the whole load: a whole number (halves to
 // even) within the type's range, a boolean from a number or the text True/False (any case).

@@ -36,11 +36,11 @@ void replace_first(std::string& text, std::string_view from, std::string_view to
 }
 
 // printf's %.*e or %.*f of `value`, with "." for the point.
-std::string c_format(const char* spec, int precision, double value) {
-    const int size = std::snprintf(nullptr, 0, spec, precision, value);
+std::string c_format(const char* format, int precision, double value) {
+    const int size = std::snprintf(nullptr, 0, format, precision, value);
     if (size <= 0) return {};
     std::string text(static_cast<std::size_t>(size) + 1, '\0');
-    std::snprintf(text.data(), text.size(), spec, precision, value);
+    std::snprintf(text.data(), text.size(), format, precision, value);
     text.resize(static_cast<std::size_t>(size));
     replace_first(text, locale_point(), ".");
     return text;

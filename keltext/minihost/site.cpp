@@ -8,32 +8,6 @@
 #include "keltext/widgetmodel/masked_edit.h"
 
 namespace kel::mini {
-namespace {
-
-// A by-reference argument the form's code changed goes back to the control in the kind the
-// control gave it; a value that cannot take that kind leaves the control's value.
-Variant coerce_like(const Variant& value, const Variant& given) {
-    try {
-        switch (given.kind()) {
-        case VarKind::Byte: return to_byte(value);
-        case VarKind::Int16: return to_int16(value);
-        case VarKind::Int32: return to_int32(value);
-        case VarKind::Single: return to_single(value);
-        case VarKind::Double: return to_double(value);
-        case VarKind::Boolean: return to_bool(value);
-        case VarKind::String: return text_of(value);
-        case VarKind::Date: return value.kind() == VarKind::Date ? value : given;
-        case VarKind::Object: return value.is_object() ? value : given;
-        case VarKind::Empty: return value;
-        }
-    } catch (const RuntimeError&) {
-        // 13 or 6: the form left a value that does not convert to the kind; the control's
-        // value stands. Which values convert is the conversions' own rule, so it is asked.
-    }
-    return given;
-}
-
-}  // namespace
 
 MiniSite::MiniSite(FormServices& form, const ClassInfo& cls, std::string name, float width, float height,
                    std::optional<std::vector<HostedControl*>> selected)

@@ -9,31 +9,6 @@
 #include "keltext/qt/views.h"
 
 namespace kel::qt {
-namespace {
-
-// A by-reference argument the form's code changed goes back to the control in the kind the
-// control gave it; a value that cannot take that kind leaves the control's value.
-Variant coerce_like(const Variant& value, const Variant& given) {
-    try {
-        switch (given.kind()) {
-        case VarKind::Byte: return to_byte(value);
-        case VarKind::Int16: return to_int16(value);
-        case VarKind::Int32: return to_int32(value);
-        case VarKind::Single: return to_single(value);
-        case VarKind::Double: return to_double(value);
-        case VarKind::Boolean: return to_bool(value);
-        case VarKind::String: return text_of(value);
-        case VarKind::Date: return value.kind() == VarKind::Date ? value : given;
-        case VarKind::Object: return value.is_object() ? value : given;
-        case VarKind::Empty: return value;
-        }
-    } catch (const RuntimeError&) {
-        // The form left a value that does not convert to the kind: the control's value stands.
-    }
-    return given;
-}
-
-}  // namespace
 
 QtSite::QtSite(Services& services, const ClassInfo& cls, std::string name, QWidget& container, SiteOwner* owner,
                float width, float height, std::optional<std::vector<model::HostedControl*>> selected)
